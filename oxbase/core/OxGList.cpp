@@ -1,0 +1,11 @@
+#include "oxbase/core/OxGList.h"
+
+#include <iostream>
+
+namespace oxdetail {
+void reportListRange(unsigned int index, unsigned int length) {
+    std::cout << "Ooops, trying to access element " << index << " in OxList of length " << length
+              << "\n"
+              << std::flush;
+}
+} // namespace oxdetail

@@ -1,0 +1,154 @@
+#include "oxbase/diag/OxPrt.h"
+
+#include "oxbase/core/OxString.h"
+#include "oxbase/diag/OxMsg.h"
+
+#include <algorithm>
+#include <iomanip>
+
+char const* const OxPrt::sep_major_top =
+    "-------------------------------==<<</|\\>>>==-------------------------------\n";
+char const* const OxPrt::sep_major_bot =
+    "-------------------------------==<<<\\|/>>>==-------------------------------\n";
+char const* const OxPrt::sep_minor =
+    "----------------------------------------------------------------------------\n";
+char OxPrt::indent[41] = {};
+short OxPrt::curpos = 0;
+unsigned int OxPrt::trace_threshold = 0;
+
+OxPrt::OxPrt() {
+    newStream();
+    str->setf(std::ios::fixed | std::ios::dec | std::ios::right | std::ios::showpoint);
+    indent[0] = '\0';
+    curpos = 0;
+}
+
+OxPrt::~OxPrt() {
+    flushPrt();
+    delete str;
+    str = nullptr;
+    indent[0] = '\0';
+    curpos = 0;
+}
+
+void OxPrt::newStream() {
+    str = new std::ostrstream;
+    // A size request only: the buffer of a dynamic ostrstream grows as needed.
+    str->rdbuf()->pubsetbuf(nullptr, bufferSize);
+}
+
+void OxPrt::flushPrt() {
+    *str << std::flush << std::ends;
+    str->freeze(true);
+    const char* text = str->str();
+    OxMsg::LogForce(text);
+    if (callback != nullptr) {
+        callback(text, userData);
+    }
+    str->freeze(false);
+    delete str;
+    newStream();
+}
+
+char* OxPrt::flushToString() {
+    *str << std::flush << std::ends;
+    str->freeze(true);
+    char* text = OxString::dup(str->str());
+    str->freeze(false);
+    delete str;
+    newStream();
+    return text;
+}
+
+OxBool OxPrt::isFull() const {
+    return OxToBool(str->pcount() > 2000000);
+}
+
+void OxPrt::setDefaultFormat() {
+    str->setf(std::ios::fixed | std::ios::dec | std::ios::right | std::ios::showpoint);
+}
+
+void OxPrt::resetFormat() {
+    str->unsetf(std::ios::floatfield);
+    str->unsetf(std::ios::basefield);
+    str->unsetf(std::ios::adjustfield);
+    str->unsetf(std::ios::showpoint);
+}
+
+std::ostrstream& OxPrt::trace() {
+    return *tracePrt.str;
+}
+
+void OxPrt::flushTrace() {
+    tracePrt.flushPrt();
+}
+
+void OxPrt::moveIndent(short to) {
+    indent[curpos] = ' ';
+    curpos = to;
+    indent[to] = '\0';
+}
+
+void OxPrt::setIndent(short value) {
+    if (value == curpos || value < 0 || value > 40) {
+        return;
+    }
+    moveIndent(value);
+}
+
+void OxPrt::adjustIndent(short delta) {
+    int target = curpos + delta;
+    if (target < 0 || target > 40) {
+        return;
+    }
+    moveIndent(static_cast<short>(target));
+}
+
+void OxPrt::printHex(std::ostrstream* stream, const unsigned char* bytes, size_t count,
+                     size_t offset) {
+    if (stream == nullptr || (bytes == nullptr && count != 0)) {
+        return;
+    }
+    char column[16];
+    std::fill(column, column + 16, ' ');
+    for (size_t i = 0; i < count; i++) {
+        size_t p = offset + i;
+        size_t c = p % 16;
+        if (c == 0) {
+            stream->setf(std::ios::right, std::ios::adjustfield);
+            *stream << std::hex << std::setfill('0') << std::setw(6)
+                    << static_cast<unsigned long long>(p) << " ";
+        }
+        *stream << std::hex << std::setfill('0') << std::setw(2)
+                << static_cast<unsigned int>(bytes[i]) << " ";
+        column[c] = (bytes[i] >= 0x20 && bytes[i] <= 0x7F) ? static_cast<char>(bytes[i]) : '.';
+        if (c == 15) {
+            *stream << "| ";
+            stream->write(column, 16);
+            *stream << "\n";
+            std::fill(column, column + 16, ' ');
+        }
+    }
+    *stream << std::dec;
+    size_t end = offset + count;
+    *stream << std::setfill(' ');
+    if (end % 16 == 0) {
+        return;
+    }
+    size_t r = end % 16;
+    *stream << std::setw(static_cast<int>(50 - 3 * r)) << "| ";
+    stream->write(column, 16);
+    *stream << "\n"
+            << "\n";
+}
+
+void OxPrt::printHex(std::ostrstream* stream, const unsigned char* bytes, size_t count) {
+    printHex(stream, bytes, count, 0);
+}
+
+void OxPrtInit() {}
+
+std::ostrstream& oxIndent(std::ostrstream& stream) {
+    stream << std::setw(OxPrt::curpos + 1) << " ";
+    return stream;
+}

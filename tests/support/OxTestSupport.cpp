@@ -1,0 +1,69 @@
+#include "support/OxTestSupport.h"
+
+#include <atomic>
+#include <filesystem>
+#include <fstream>
+#include <random>
+#include <sstream>
+
+namespace oxtest {
+
+TempDir::TempDir() {
+    static std::atomic<unsigned> counter{0};
+    std::random_device seed;
+    std::filesystem::path base = std::filesystem::temp_directory_path();
+    for (;;) {
+        std::filesystem::path candidate =
+            base / ("oxbase-test-" + std::to_string(seed()) + "-" + std::to_string(counter++));
+        std::error_code error;
+        if (std::filesystem::create_directory(candidate, error)) {
+            dir = candidate.string();
+            return;
+        }
+    }
+}
+
+TempDir::~TempDir() {
+    std::error_code error;
+    // Make everything writable and searchable again, so that tests that take
+    // permissions away do not leave debris behind.
+    for (auto it = std::filesystem::recursive_directory_iterator(
+             dir, std::filesystem::directory_options::skip_permission_denied, error);
+         !error && it != std::filesystem::recursive_directory_iterator(); it.increment(error)) {
+        if (!it->is_symlink()) {
+            std::filesystem::permissions(it->path(), std::filesystem::perms::owner_all,
+                                         std::filesystem::perm_options::add, error);
+        }
+    }
+    std::filesystem::remove_all(dir, error);
+}
+
+std::string TempDir::file(const std::string& name) const {
+    return dir + "/" + name;
+}
+
+std::string readFile(const std::string& path) {
+    std::ifstream in(path, std::ios::binary);
+    std::ostringstream bytes;
+    bytes << in.rdbuf();
+    return bytes.str();
+}
+
+void writeFile(const std::string& path, const std::string& bytes) {
+    std::ofstream out(path, std::ios::binary | std::ios::trunc);
+    out.write(bytes.data(), static_cast<std::streamsize>(bytes.size()));
+}
+
+std::string dataFile(const std::string& name) {
+    return std::string(OXBASE_DATA_DIR) + "/" + name;
+}
+
+std::string streamText(std::ostrstream& stream) {
+    // str() freezes the buffer; thaw it again so the stream stays usable.
+    const char* text = stream.str();
+    std::string copy(text, static_cast<size_t>(stream.pcount()));
+    stream.freeze(false);
+    return copy;
+}
+
+} // namespace oxtest

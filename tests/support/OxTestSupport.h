@@ -1,0 +1,40 @@
+// Helpers shared by the test suites: scratch directories, whole-file reads and
+// writes, and the path of the bundled data directory.
+#ifndef OXBASE_TESTS_OXTESTSUPPORT_H
+#define OXBASE_TESTS_OXTESTSUPPORT_H
+
+#include "oxbase/platform/OxStrstream.h"
+
+#include <string>
+
+namespace oxtest {
+
+/// A fresh directory under the system's temporary directory, removed with
+/// everything in it when the object goes.
+class TempDir {
+public:
+    TempDir();
+    ~TempDir();
+    TempDir(const TempDir&) = delete;
+    TempDir& operator=(const TempDir&) = delete;
+
+    const std::string& path() const { return dir; }
+    /// `path()` + "/" + `name`.
+    std::string file(const std::string& name) const;
+
+private:
+    std::string dir;
+};
+
+/// The whole content of a file as bytes; empty when it cannot be read.
+std::string readFile(const std::string& path);
+/// Writes `bytes` to `path`, replacing the file.
+void writeFile(const std::string& path, const std::string& bytes);
+/// A file of the bundled data directory.
+std::string dataFile(const std::string& name);
+/// The text of an ostrstream so far, without changing its freeze state.
+std::string streamText(std::ostrstream& stream);
+
+} // namespace oxtest
+
+#endif
