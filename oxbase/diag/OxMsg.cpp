@@ -1,0 +1,476 @@
+#include "oxbase/diag/OxMsg.h"
+
+#include "oxbase/core/OxString.h"
+#include "oxbase/platform/OxPlatformPath.h"
+
+#include <cstdio>
+#include <cstring>
+#include <iomanip>
+#include <iostream>
+#include <new>
+#include <string>
+
+// All state is process-wide. The message list itself is defined with the other
+// ordered statics in oxbase/core/OxStatics.cpp.
+OxMsgSubSystemState OxMsg::state = OxMsgInactive;
+OxBool OxMsg::valid = OxFalse;
+OxBool OxMsg::verbose = OxFalse;
+OxErrorCode OxMsg::error_code = OxErrorNone;
+int OxMsg::message_threshold = 99;
+char* OxMsg::buf = nullptr;
+int OxMsg::buflen = 0;
+std::ifstream* OxMsg::msgFile = nullptr;
+std::ofstream* OxMsg::logFile = nullptr;
+OxGBinaryTree<OxMsgRecord_s*>* OxMsg::msgTree = nullptr;
+char* OxMsg::msgFileName = nullptr;
+char* OxMsg::logFileName = nullptr;
+OxMsg::Callback OxMsg::pMsgCallback = nullptr;
+void* OxMsg::pUserData = nullptr;
+
+namespace {
+constexpr int kInitialBufferSize = 51200;
+constexpr std::streamsize kTextLimit = 5120; // text of a line: at most 5,119 characters
+
+/// Letter of a message type in the message file and the log; blank when unknown.
+char typeLetter(std::uint32_t type) {
+    switch (type) {
+    case OxMsgTypeInfo:
+        return 'I';
+    case OxMsgTypeWarning:
+        return 'W';
+    case OxMsgTypeError:
+        return 'E';
+    case OxMsgTypeSevere:
+        return 'S';
+    case OxMsgTypeFatal:
+        return 'F';
+    default:
+        return ' ';
+    }
+}
+
+std::uint32_t typeFromLetter(char letter) {
+    for (std::uint32_t type = OxMsgTypeInfo; type <= OxMsgTypeFatal; type++) {
+        if (typeLetter(type) == letter) {
+            return type;
+        }
+    }
+    return OxMsgTypeUnknown;
+}
+
+OxErrorCode severityOf(std::uint32_t type) {
+    switch (type) {
+    case OxMsgTypeWarning:
+        return OxErrorWarning;
+    case OxMsgTypeError:
+        return OxErrorError;
+    case OxMsgTypeSevere:
+        return OxErrorSevere;
+    case OxMsgTypeFatal:
+        return OxErrorFatal;
+    default:
+        return OxErrorNone;
+    }
+}
+
+/// A trimmed copy of `name` (a new array), null when nothing is left.
+char* trimmedCopy(const char* name) {
+    char* copy = OxString::dup(name);
+    OxString::stripWhite(copy);
+    if (copy != nullptr && *copy == '\0') {
+        delete[] copy;
+        return nullptr;
+    }
+    return copy;
+}
+
+/// Path of a file named `name` in `directory`, or in the working directory
+/// when `directory` is null; an absolute name stands as it is. Empty when the
+/// working directory is needed and cannot be read.
+std::string pathIn(const char* directory, const char* name) {
+    if (OxPlatformIsAbsolute(name)) {
+        return name;
+    }
+    std::string base;
+    if (directory != nullptr) {
+        base = directory;
+    } else if (!OxPlatformGetCwd(base)) {
+        return std::string();
+    }
+    return OxPlatformJoinPath(base, name);
+}
+
+/// Reads the rest of a line into `text` (at most 5,119 characters); the
+/// carriage return of a CR LF line end is not part of the text.
+void readText(std::istream& in, char* text) {
+    text[0] = '\0';
+    in.getline(text, kTextLimit, '\n');
+    size_t length = std::strlen(text);
+    if (length > 0 && text[length - 1] == '\r') {
+        text[length - 1] = '\0';
+    }
+}
+
+template <class Stream> void closeAndDelete(Stream*& stream) {
+    if (stream != nullptr) {
+        stream->close();
+        delete stream;
+        stream = nullptr;
+    }
+}
+} // namespace
+
+OxMsg::OxMsg(const char* messageFileName, const char* msgDirectory, const char* logName,
+             const char* logDirectory) {
+    if (state == OxMsgActive) {
+        shutdown();
+    }
+    if (buf == nullptr) {
+        buf = new (std::nothrow) char[kInitialBufferSize];
+        if (buf == nullptr) {
+            std::cerr << "Message file buffer is NULL." << "\n";
+            buflen = 0;
+            return;
+        }
+        buflen = kInitialBufferSize;
+    }
+    message_threshold = 99;
+    error_code = OxErrorNone;
+    if (messageFileName == nullptr) {
+        std::cerr << "Message file name is NULL." << "\n";
+        return;
+    }
+
+    // The file is looked for in the working directory first, then in
+    // `msgDirectory`; an absolute name is opened as it stands. An empty name
+    // has no file to find and fails like a missing one.
+    char* name = trimmedCopy(messageFileName);
+    const char* shownName = name != nullptr ? name : "";
+    std::string directoryPath;
+    std::string opened;
+    auto tryOpen = [&opened](const std::string& path) {
+        if (path.empty()) {
+            return false;
+        }
+        msgFile = new std::ifstream(OxPlatformNativePath(path.c_str()));
+        if (msgFile->good()) {
+            opened = path;
+            return true;
+        }
+        closeAndDelete(msgFile);
+        return false;
+    };
+    bool found = false;
+    if (name != nullptr) {
+        if (OxPlatformIsAbsolute(name)) {
+            found = tryOpen(name);
+        } else {
+            found = tryOpen(pathIn(nullptr, name));
+            if (!found && msgDirectory != nullptr) {
+                directoryPath = pathIn(msgDirectory, name);
+                found = tryOpen(directoryPath);
+            }
+        }
+    }
+    if (!found) {
+        std::cerr << "Unable to open " << shownName << "\n" << std::flush;
+        std::cerr << "Tried ";
+        if (!directoryPath.empty()) {
+            std::cerr << directoryPath << " and ";
+        }
+        std::cerr << shownName << "," << "\n" << std::flush;
+        std::string cwd;
+        if (OxPlatformGetCwd(cwd)) {
+            std::cerr << "in current working directory, " << cwd << "\n" << std::flush;
+        }
+        delete[] name;
+        return;
+    }
+    delete[] name;
+
+    msgFileName = OxString::dup(opened.c_str());
+    if (msgTree == nullptr) {
+        msgTree = new OxGBinaryTree<OxMsgRecord_s*>;
+    }
+    readMessageFile();
+    closeAndDelete(msgFile);
+
+    char* logName2 = trimmedCopy(logName);
+    if (logName2 == nullptr) {
+        valid = OxTrue;
+        state = OxMsgActive;
+        return;
+    }
+    logFile = openLog(logName2, logDirectory);
+    delete[] logName2;
+    if (logFile == nullptr) {
+        return;
+    }
+    valid = OxTrue;
+    state = OxMsgActive;
+}
+
+OxMsg::~OxMsg() { shutdown(); }
+
+void OxMsg::readMessageFile() {
+    std::ifstream& in = *msgFile;
+    unsigned int lineCount = 0;
+    unsigned int number = 0;
+    while (in.good()) {
+        in >> std::dec >> number;
+        lineCount++;
+        if (in.fail()) {
+            break;
+        }
+        if (number == 0) {
+            in.ignore(kTextLimit, '\n'); // a comment line
+            continue;
+        }
+        char* text = new char[kTextLimit + 1];
+        OxGBinaryTree<OxMsgRecord_s*>::Node* node = msgTree->find(number);
+        if (node != msgTree->nullNode) {
+            // A known number continues the text of its message on a new line.
+            readText(in, text);
+            OxMsgRecord_s* record = node->value;
+            char* joined = OxString::combine(record->text != nullptr ? record->text : "", "\n\t");
+            joined = OxString::append(joined, text);
+            delete[] record->text;
+            record->text = joined;
+            delete[] text;
+            continue;
+        }
+        auto* record = new OxMsgRecord_s;
+        char c = '\0';
+        in >> c;
+        if (c != ',') {
+            std::cerr << " No message delimiter in message number " << number
+                      << ".  Setting message type to unknown." << "\n"
+                      << std::flush;
+            record->type = OxMsgTypeUnknown;
+        } else {
+            c = '\0';
+            in >> c;
+            record->type = typeFromLetter(c);
+        }
+        c = '\0';
+        in >> c;
+        if (c != ',') {
+            std::cerr << " No message delimiter in message number " << number
+                      << ".  Setting message level to default value." << "\n"
+                      << std::flush;
+            record->level = 0;
+        } else {
+            in >> std::dec >> record->level;
+        }
+        readText(in, text);
+        record->text = text;
+        msgList.append(record);
+        msgTree->insert(number, record);
+    }
+    if (!in.eof() && in.fail()) {
+        std::cerr << "Error reading message file " << msgFileName << " at line " << lineCount
+                  << "\n"
+                  << std::flush;
+    }
+}
+
+std::ofstream* OxMsg::openLog(const char* name, const char* directory) {
+    std::string path = pathIn(directory, name);
+    logFileName = OxString::dup(path.c_str());
+    auto* stream = new std::ofstream(OxPlatformNativePath(path.c_str()),
+                                     std::ios::out | std::ios::trunc);
+    if (path.empty() || !stream->good()) {
+        delete stream;
+        std::cerr << " Unable to open " << path << "\n" << std::flush;
+        delete[] logFileName;
+        logFileName = nullptr;
+        return nullptr;
+    }
+    stream->setf(std::ios::left, std::ios::adjustfield);
+    return stream;
+}
+
+void OxMsg::openLogFile(const char* name, const char* directory) {
+    if (valid != OxTrue) {
+        return;
+    }
+    if (logFile != nullptr) {
+        closeAndDelete(logFile);
+        delete[] logFileName;
+        logFileName = nullptr;
+    }
+    char* trimmed = trimmedCopy(name);
+    if (trimmed == nullptr) {
+        std::cerr << "Log file name is null.  No logging will be done." << "\n" << std::flush;
+        return;
+    }
+    logFile = openLog(trimmed, directory);
+    delete[] trimmed;
+}
+
+void OxMsg::closeLogFile() {
+    if (valid != OxTrue || logFile == nullptr) {
+        return;
+    }
+    closeAndDelete(logFile);
+    delete[] logFileName;
+    logFileName = nullptr;
+}
+
+void OxMsg::setMessageThreshold(int threshold) {
+    message_threshold = threshold < 1 ? 1 : (threshold > 99 ? 99 : threshold);
+}
+
+OxMsgRecord_s* OxMsg::format(unsigned int number, va_list arguments) {
+    if (valid != OxTrue) {
+        return nullptr;
+    }
+    OxGBinaryTree<OxMsgRecord_s*>::Node* node = msgTree->find(number);
+    if (node == msgTree->nullNode) {
+        std::cerr << " There is no message at index " << number << "\n" << std::flush;
+        return nullptr;
+    }
+    OxMsgRecord_s* record = node->value;
+    if (record->level != 0 && message_threshold > record->level) {
+        return nullptr;
+    }
+    const char* text = record->text != nullptr ? record->text : "";
+    // The buffer only grows, by doubling, until the formatted text fits.
+    bool retriedError = false;
+    for (;;) {
+        if (buf == nullptr) {
+            return nullptr;
+        }
+        va_list attempt;
+        va_copy(attempt, arguments);
+        int written = std::vsnprintf(buf, static_cast<size_t>(buflen), text, attempt);
+        va_end(attempt);
+        if (written >= 0 && written < buflen) {
+            break;
+        }
+        if (written < 0 && retriedError) {
+            buf[0] = '\0';
+            break; // the text cannot be formatted: log what is there
+        }
+        retriedError = retriedError || written < 0;
+        int grown = buflen > 0 ? buflen : kInitialBufferSize;
+        while (grown <= written && grown < (1 << 30)) {
+            grown *= 2;
+        }
+        if (grown == buflen) {
+            grown *= 2;
+        }
+        delete[] buf;
+        buf = new (std::nothrow) char[static_cast<size_t>(grown)];
+        buflen = buf != nullptr ? grown : 0;
+    }
+    buf[buflen - 1] = '\0';
+    return record;
+}
+
+void OxMsg::LogCommon(OxBool force, unsigned int number, va_list arguments) {
+    OxMsgRecord_s* record = format(number, arguments);
+    if (record == nullptr) {
+        return;
+    }
+    char letter = typeLetter(record->type);
+    OxErrorCode severity = severityOf(record->type);
+    if (error_code < severity) {
+        error_code = severity;
+    }
+    if (logFile != nullptr) {
+        *logFile << std::right << std::setfill(' ') << std::setw(3) << number << std::left
+                 << letter << ": " << buf << "\n"
+                 << std::flush;
+    }
+    if (pMsgCallback != nullptr) {
+        pMsgCallback(buf, pUserData);
+    }
+    bool quiet = force != OxTrue && letter == 'I' && verbose != OxTrue && logFile != nullptr;
+    if (!quiet) {
+        std::cerr << buf << "\n" << std::flush;
+    }
+}
+
+void OxMsg::Log(unsigned int number, ...) {
+    va_list arguments;
+    va_start(arguments, number);
+    LogCommon(OxFalse, number, arguments);
+    va_end(arguments);
+}
+
+void OxMsg::LogError(unsigned int number, ...) {
+    va_list arguments;
+    va_start(arguments, number);
+    LogCommon(OxFalse, number, arguments);
+    va_end(arguments);
+}
+
+void OxMsg::LogForce(unsigned int number, ...) {
+    va_list arguments;
+    va_start(arguments, number);
+    LogCommon(OxTrue, number, arguments);
+    va_end(arguments);
+}
+
+const char* OxMsg::LogToString(unsigned int number, ...) {
+    va_list arguments;
+    va_start(arguments, number);
+    OxMsgRecord_s* record = format(number, arguments);
+    va_end(arguments);
+    return record != nullptr ? buf : nullptr;
+}
+
+namespace {
+void logText(const char* text, bool force, std::ofstream* log, OxMsg::Callback callback,
+             void* userData, bool verbose) {
+    if (log != nullptr) {
+        *log << text << std::flush;
+    }
+    if (callback != nullptr) {
+        callback(text, userData);
+    }
+    if (force || verbose || log == nullptr) {
+        std::cerr << text << std::flush;
+    }
+}
+} // namespace
+
+void OxMsg::Log(const char* text) {
+    if (text == nullptr || valid != OxTrue) {
+        return;
+    }
+    logText(text, false, logFile, pMsgCallback, pUserData, verbose == OxTrue);
+}
+
+void OxMsg::LogForce(const char* text) {
+    if (text == nullptr || valid != OxTrue) {
+        return;
+    }
+    logText(text, true, logFile, pMsgCallback, pUserData, verbose == OxTrue);
+}
+
+void OxMsg::shutdown() {
+    delete[] buf;
+    buf = nullptr;
+    buflen = 0;
+    closeAndDelete(logFile);
+    closeAndDelete(msgFile);
+    delete[] msgFileName;
+    msgFileName = nullptr;
+    delete[] logFileName;
+    logFileName = nullptr;
+    delete msgTree;
+    msgTree = nullptr;
+    for (unsigned int i = 0; i < msgList.length; i++) {
+        delete[] msgList.data[i]->text;
+        delete msgList.data[i];
+    }
+    msgList.makeEmpty();
+    message_threshold = 99;
+    pMsgCallback = nullptr;
+    pUserData = nullptr;
+    valid = OxFalse;
+    verbose = OxFalse;
+    state = OxMsgInactive;
+}
