@@ -128,7 +128,8 @@ OxMsg::OxMsg(const char* messageFileName, const char* msgDirectory, const char* 
     if (buf == nullptr) {
         buf = new (std::nothrow) char[kInitialBufferSize];
         if (buf == nullptr) {
-            std::cerr << "Message file buffer is NULL." << "\n";
+            std::cerr << "Message file buffer is NULL."
+                      << "\n";
             buflen = 0;
             return;
         }
@@ -137,7 +138,8 @@ OxMsg::OxMsg(const char* messageFileName, const char* msgDirectory, const char* 
     message_threshold = 99;
     error_code = OxErrorNone;
     if (messageFileName == nullptr) {
-        std::cerr << "Message file name is NULL." << "\n";
+        std::cerr << "Message file name is NULL."
+                  << "\n";
         return;
     }
 
@@ -178,7 +180,9 @@ OxMsg::OxMsg(const char* messageFileName, const char* msgDirectory, const char* 
         if (!directoryPath.empty()) {
             std::cerr << directoryPath << " and ";
         }
-        std::cerr << shownName << "," << "\n" << std::flush;
+        std::cerr << shownName << ","
+                  << "\n"
+                  << std::flush;
         std::string cwd;
         if (OxPlatformGetCwd(cwd)) {
             std::cerr << "in current working directory, " << cwd << "\n" << std::flush;
@@ -210,7 +214,9 @@ OxMsg::OxMsg(const char* messageFileName, const char* msgDirectory, const char* 
     state = OxMsgActive;
 }
 
-OxMsg::~OxMsg() { shutdown(); }
+OxMsg::~OxMsg() {
+    shutdown();
+}
 
 void OxMsg::readMessageFile() {
     std::ifstream& in = *msgFile;
@@ -244,7 +250,8 @@ void OxMsg::readMessageFile() {
         in >> c;
         if (c != ',') {
             std::cerr << " No message delimiter in message number " << number
-                      << ".  Setting message type to unknown." << "\n"
+                      << ".  Setting message type to unknown."
+                      << "\n"
                       << std::flush;
             record->type = OxMsgTypeUnknown;
         } else {
@@ -256,7 +263,8 @@ void OxMsg::readMessageFile() {
         in >> c;
         if (c != ',') {
             std::cerr << " No message delimiter in message number " << number
-                      << ".  Setting message level to default value." << "\n"
+                      << ".  Setting message level to default value."
+                      << "\n"
                       << std::flush;
             record->level = 0;
         } else {
@@ -277,8 +285,8 @@ void OxMsg::readMessageFile() {
 std::ofstream* OxMsg::openLog(const char* name, const char* directory) {
     std::string path = pathIn(directory, name);
     logFileName = OxString::dup(path.c_str());
-    auto* stream = new std::ofstream(OxPlatformNativePath(path.c_str()),
-                                     std::ios::out | std::ios::trunc);
+    auto* stream =
+        new std::ofstream(OxPlatformNativePath(path.c_str()), std::ios::out | std::ios::trunc);
     if (path.empty() || !stream->good()) {
         delete stream;
         std::cerr << " Unable to open " << path << "\n" << std::flush;
@@ -301,7 +309,9 @@ void OxMsg::openLogFile(const char* name, const char* directory) {
     }
     char* trimmed = trimmedCopy(name);
     if (trimmed == nullptr) {
-        std::cerr << "Log file name is null.  No logging will be done." << "\n" << std::flush;
+        std::cerr << "Log file name is null.  No logging will be done."
+                  << "\n"
+                  << std::flush;
         return;
     }
     logFile = openLog(trimmed, directory);
@@ -379,8 +389,8 @@ void OxMsg::LogCommon(OxBool force, unsigned int number, va_list arguments) {
         error_code = severity;
     }
     if (logFile != nullptr) {
-        *logFile << std::right << std::setfill(' ') << std::setw(3) << number << std::left
-                 << letter << ": " << buf << "\n"
+        *logFile << std::right << std::setfill(' ') << std::setw(3) << number << std::left << letter
+                 << ": " << buf << "\n"
                  << std::flush;
     }
     if (pMsgCallback != nullptr) {

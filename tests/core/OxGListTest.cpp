@@ -1,0 +1,167 @@
+#include "oxbase/core/OxGList.h"
+#include "oxbase/core/OxGBinaryTree.h"
+#include "support/OxTestSupport.h"
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <random>
+#include <sstream>
+#include <vector>
+
+TEST(OxGList, GrowthFollowsPowersOfTwo) {
+    OxGList<unsigned int> list;
+    EXPECT_EQ(list.capacity, 4u);
+    EXPECT_EQ(list.append(10), 0u);
+    for (unsigned int i = 1; i < 4; i++) {
+        list.append(i);
+    }
+    EXPECT_EQ(list.capacity, 4u);
+    list.append(5);
+    EXPECT_EQ(list.capacity, 8u);
+    for (unsigned int i = 0; i < 3; i++) {
+        list.append(i);
+    }
+    EXPECT_EQ(list.capacity, 8u);
+    EXPECT_EQ(list.append(9), 8u);
+    EXPECT_EQ(list.capacity, 16u);
+    EXPECT_EQ(list[0], 10u);
+
+    list.makeEmpty();
+    EXPECT_EQ(list.data, nullptr);
+    list.append(1);
+    EXPECT_EQ(list.capacity, 1u);
+    list.append(2);
+    EXPECT_EQ(list.capacity, 2u);
+    list.append(3);
+    EXPECT_EQ(list.capacity, 4u);
+
+    OxGList<unsigned int> reserved;
+    reserved.reserve(3);
+    EXPECT_EQ(reserved.capacity, 4u);
+    reserved.reserve(5);
+    EXPECT_EQ(reserved.capacity, 8u);
+    reserved.makeEmpty();
+    reserved.reserve(1);
+    EXPECT_EQ(reserved.capacity, 1u);
+}
+
+TEST(OxGList, RangeReportOnlyBeyondLength) {
+    OxGList<unsigned int> list;
+    list.append(7);
+    list.append(8);
+    testing::internal::CaptureStdout();
+    list[2] = 9; // index equal to length: within capacity and not reported
+    EXPECT_EQ(testing::internal::GetCapturedStdout(), "");
+    testing::internal::CaptureStdout();
+    list.set(3, 1);
+    EXPECT_EQ(testing::internal::GetCapturedStdout(),
+              "Ooops, trying to access element 3 in OxList of length 2\n");
+}
+
+TEST(OxGList, CopySharesPointeesAndRemoveNullsKeepsOrder) {
+    int a = 1, b = 2, c = 3;
+    auto* list = new OxGList<int*>;
+    list->append(&a);
+    list->append(nullptr);
+    list->append(&b);
+    list->append(nullptr);
+    list->append(&c);
+    {
+        OxGList<int*> copy(*list);
+        EXPECT_EQ(copy.capacity, 8u);
+        EXPECT_EQ(copy[4], &c);
+    }
+    list->removeNulls();
+    ASSERT_EQ(list->length, 3u);
+    EXPECT_EQ(list->capacity, 8u);
+    EXPECT_EQ((*list)[0], &a);
+    EXPECT_EQ((*list)[1], &b);
+    EXPECT_EQ((*list)[2], &c);
+    delete list; // through the base pointer: the pointees stay
+    EXPECT_EQ(c, 3);
+}
+
+TEST(OxGList, SortOnBothPathsAndRemoveDuplicates) {
+    std::mt19937 random(12345);
+    for (unsigned int size : {0u, 1u, 2u, 9u, 10u, 11u, 100u, 1000u}) {
+        std::vector<unsigned int> values(size);
+        for (unsigned int& v : values) {
+            v = random() % 50; // many equal keys
+        }
+        OxGList<unsigned int> list;
+        for (unsigned int v : values) {
+            list.append(v);
+        }
+        list.sort();
+        std::sort(values.begin(), values.end());
+        ASSERT_EQ(list.length, size);
+        for (unsigned int i = 0; i < size; i++) {
+            ASSERT_EQ(list[i], values[i]) << "size " << size << " index " << i;
+        }
+        list.removeDuplicates();
+        values.erase(std::unique(values.begin(), values.end()), values.end());
+        ASSERT_EQ(list.length, values.size());
+        for (unsigned int i = 0; i < list.length; i++) {
+            ASSERT_EQ(list[i], values[i]);
+        }
+    }
+    OxGList<unsigned int> runs;
+    for (unsigned int v : {1u, 1u, 2u, 2u, 2u, 3u}) {
+        runs.append(v);
+    }
+    runs.removeDuplicates();
+    ASSERT_EQ(runs.length, 3u);
+    EXPECT_EQ(runs[0], 1u);
+    EXPECT_EQ(runs[1], 2u);
+    EXPECT_EQ(runs[2], 3u);
+}
+
+TEST(OxGBinaryTree, AscendingInsertStaysBalanced) {
+    OxGBinaryTree<int> tree;
+    EXPECT_EQ(tree.find(3), tree.nullNode);
+    for (unsigned int key = 1; key <= 7; key++) {
+        tree.insert(key, static_cast<int>(key * 10));
+    }
+    EXPECT_EQ(tree.root->key, 4u);
+    EXPECT_EQ(tree.root->level, 3u);
+    EXPECT_EQ(tree.root->left->key, 2u);
+    EXPECT_EQ(tree.root->right->key, 6u);
+    tree.insert(5, 999);
+    EXPECT_EQ(tree.find(5)->value, 50);
+    EXPECT_EQ(tree.find(8), tree.nullNode);
+
+    // A large tree keeps every key findable and its depth logarithmic.
+    OxGBinaryTree<unsigned int> large;
+    for (unsigned int key = 0; key < 100000; key++) {
+        large.insert(key * 7919u % 100003u, key);
+    }
+    for (unsigned int key = 0; key < 100000; key += 97) {
+        ASSERT_EQ(large.find(key * 7919u % 100003u)->value, key);
+    }
+    EXPECT_LE(large.root->level, 18u);
+}
+
+TEST(OxGBinaryTree, DumpText) {
+    OxGBinaryTree<int> tree;
+    std::ostrstream stream;
+    tree.dump(&stream, nullptr);
+    tree.dump(&stream, tree.root);
+    EXPECT_EQ(oxtest::streamText(stream),
+              "Warning: current node is NULL.\nCurrent node is a terminal node.\n");
+
+    tree.insert(2, 0);
+    tree.insert(1, 0);
+    std::ostrstream two;
+    tree.dump(&two, tree.root);
+    // Keys 1 and 2: the skew makes 1 the root with 2 as its right child.
+    std::ostringstream expected;
+    expected << "Current node = " << std::hex << static_cast<const void*>(tree.root) << std::dec
+             << ", key = 1\n"
+             << "  Left child is a terminal node, Right child = " << std::hex
+             << static_cast<const void*>(tree.root->right) << std::dec << "\n"
+             << "Current node = " << std::hex << static_cast<const void*>(tree.root->right)
+             << std::dec << ", key = 2\n"
+             << "  Left child is a terminal node, Right child is a terminal node\n";
+    EXPECT_EQ(oxtest::streamText(two), expected.str());
+}

@@ -1,0 +1,229 @@
+#include "oxbase/diag/OxMsg.h"
+#include "support/OxTestSupport.h"
+
+#include <gtest/gtest.h>
+
+#include <filesystem>
+#include <memory>
+#include <string>
+#include <vector>
+
+namespace {
+const char* const kMessages = "0 test messages\n"
+                              "1,I,0Info %s\n"
+                              "2,W,0Warning %d\n"
+                              "3,E,0Error %s\n"
+                              "4,S,0Severe\n"
+                              "5,F,0Fatal\n"
+                              "6,I,5Detail at level five\n"
+                              "7,E,0Seven\n"
+                              "12,I,0First line\n"
+                              "12 second line\n"
+                              "1000,W,0Wide\n"
+                              "20,I,0Long %s\n";
+
+void collect(const char* text, void* userData) {
+    static_cast<std::vector<std::string>*>(userData)->push_back(text);
+}
+
+class OxMsgTest : public testing::Test {
+protected:
+    oxtest::TempDir dir;
+    std::vector<std::string> callbackTexts;
+
+    std::unique_ptr<OxMsg> start(const char* messages, const char* logName) {
+        oxtest::writeFile(dir.file("test.msg"), messages);
+        auto msg = std::make_unique<OxMsg>(dir.file("test.msg").c_str(), nullptr, logName,
+                                           dir.path().c_str());
+        OxMsg::setMsgCallback(collect);
+        OxMsg::setMsgCallbackUserData(&callbackTexts);
+        return msg;
+    }
+    std::string log() { return oxtest::readFile(dir.file("run.log")); }
+};
+} // namespace
+
+TEST_F(OxMsgTest, LevelsThresholdAndErrorCode) {
+    auto msg = start(kMessages, "run.log");
+    ASSERT_EQ(OxMsg::isValid(), OxTrue);
+    EXPECT_EQ(OxMsg::getMessageThreshold(), 99);
+    OxMsg::Log(6u);
+    OxMsg::LogForce(6u);
+    EXPECT_EQ(log(), "");
+    OxMsg::setMessageThreshold(5);
+    OxMsg::Log(6u);
+    OxMsg::setMessageThreshold(6);
+    OxMsg::Log(6u);
+    EXPECT_EQ(log(), "  6I: Detail at level five\n");
+
+    for (int in : {0, 100, -3, 50}) {
+        OxMsg::setMessageThreshold(in);
+        EXPECT_EQ(OxMsg::getMessageThreshold(), in < 1 ? 1 : (in > 99 ? 99 : in));
+    }
+
+    testing::internal::CaptureStderr();
+    EXPECT_EQ(OxMsg::getErrorCode(), OxErrorNone);
+    OxMsg::Log(3u, "x");
+    EXPECT_EQ(OxMsg::getErrorCode(), OxErrorError);
+    OxMsg::Log(2u, 1);
+    EXPECT_EQ(OxMsg::getErrorCode(), OxErrorError);
+    OxMsg::LogError(4u);
+    EXPECT_EQ(OxMsg::getErrorCode(), OxErrorSevere);
+    OxMsg::Log(5u);
+    EXPECT_EQ(OxMsg::getErrorCode(), OxErrorFatal);
+    OxMsg::resetErrorCode();
+    EXPECT_EQ(OxMsg::getErrorCode(), OxErrorNone);
+    OxMsg::Log(999u);
+    EXPECT_EQ(OxMsg::getErrorCode(), OxErrorNone);
+    std::string err = testing::internal::GetCapturedStderr();
+    EXPECT_EQ(err, "Error x\nWarning 1\nSevere\nFatal\n There is no message at index 999\n");
+    EXPECT_EQ(OxMsg::LogToString(3u, "y"), std::string("Error y"));
+    EXPECT_EQ(OxMsg::LogToString(999u), nullptr);
+    EXPECT_EQ(OxMsg::getErrorCode(), OxErrorNone);
+}
+
+TEST_F(OxMsgTest, RoutingOfInfoMessages) {
+    auto msg = start(kMessages, "run.log");
+    testing::internal::CaptureStderr();
+    OxMsg::Log(1u, "quiet");
+    EXPECT_EQ(testing::internal::GetCapturedStderr(), "");
+    testing::internal::CaptureStderr();
+    OxMsg::LogForce(1u, "forced");
+    OxMsg::setVerboseState(OxTrue);
+    OxMsg::Log(1u, "verbose");
+    OxMsg::setVerboseState(OxFalse);
+    msg->closeLogFile();
+    EXPECT_EQ(msg->isLogFileOpen(), OxFalse);
+    OxMsg::Log(1u, "no log");
+    EXPECT_EQ(testing::internal::GetCapturedStderr(), "Info forced\nInfo verbose\nInfo no log\n");
+    EXPECT_EQ(log(), "  1I: Info quiet\n  1I: Info forced\n  1I: Info verbose\n");
+    EXPECT_EQ(callbackTexts, (std::vector<std::string>{"Info quiet", "Info forced", "Info verbose",
+                                                       "Info no log"}));
+
+    // Finished texts: no number, no letter, no line end added.
+    msg->openLogFile("second.log", dir.path().c_str());
+    testing::internal::CaptureStderr();
+    OxMsg::Log("plain text|");
+    OxMsg::LogForce("forced text|");
+    EXPECT_EQ(testing::internal::GetCapturedStderr(), "forced text|");
+    EXPECT_EQ(oxtest::readFile(dir.file("second.log")), "plain text|forced text|");
+
+    testing::internal::CaptureStderr();
+    msg->openLogFile("  ", nullptr);
+    EXPECT_EQ(testing::internal::GetCapturedStderr(),
+              "Log file name is null.  No logging will be done.\n");
+    EXPECT_EQ(msg->isLogFileOpen(), OxFalse);
+}
+
+TEST_F(OxMsgTest, FileFormatContinuationsWideNumbersAndLongTexts) {
+    std::string messages = std::string(kMessages) + "30 no delimiter here\n";
+    testing::internal::CaptureStderr();
+    auto msg = start(messages.c_str(), "run.log");
+    EXPECT_EQ(testing::internal::GetCapturedStderr(),
+              " No message delimiter in message number 30.  Setting message type to unknown.\n"
+              " No message delimiter in message number 30.  Setting message level to default "
+              "value.\n");
+    OxMsg::Log(12u);
+    OxMsg::Log(1000u);
+    testing::internal::CaptureStderr();
+    OxMsg::Log(30u);
+    testing::internal::GetCapturedStderr();
+    // The unknown type logs a blank letter; the two delimiter reads took "n"
+    // and "o", so the text is what follows them.
+    EXPECT_EQ(log(), " 12I: First line\n\t second line\n1000W: Wide\n 30 :  delimiter here\n");
+
+    // A formatted text beyond the first buffer size is logged whole.
+    std::string big(60000, 'z');
+    OxMsg::Log(20u, big.c_str());
+    std::string written = log();
+    EXPECT_NE(written.find(" 20I: Long " + big + "\n"), std::string::npos);
+    EXPECT_EQ(callbackTexts.back(), "Long " + big);
+    std::string huge(300000, 'h'); // several doublings
+    EXPECT_EQ(std::string(OxMsg::LogToString(20u, huge.c_str())), "Long " + huge);
+}
+
+TEST_F(OxMsgTest, BadMessageFilesKeepWhatWasRead) {
+    std::string messages = "1,I,0Before\n" + std::string(6000, 'x') + "\n";
+    testing::internal::CaptureStderr();
+    auto msg = start(messages.c_str(), nullptr);
+    std::string err = testing::internal::GetCapturedStderr();
+    EXPECT_EQ(err, "Error reading message file " + dir.file("test.msg") + " at line 2\n");
+    ASSERT_EQ(OxMsg::isValid(), OxTrue);
+    EXPECT_EQ(std::string(OxMsg::LogToString(1u, "")), "Before");
+
+    std::string overlong = "1,I,0Kept\n2,I,0" + std::string(6000, 'y') + "\n3,I,0Lost\n";
+    testing::internal::CaptureStderr();
+    msg.reset(); // every OxMsg stops the subsystem when it goes
+    msg = start(overlong.c_str(), nullptr);
+    err = testing::internal::GetCapturedStderr();
+    EXPECT_EQ(err, "Error reading message file " + dir.file("test.msg") + " at line 2\n");
+    EXPECT_EQ(std::string(OxMsg::LogToString(1u)), "Kept");
+    // The text part of a line holds at most 5,119 characters.
+    EXPECT_TRUE(std::string(OxMsg::LogToString(2u)) == std::string(5119, 'y'));
+    testing::internal::CaptureStderr();
+    EXPECT_EQ(OxMsg::LogToString(3u), nullptr);
+    testing::internal::GetCapturedStderr();
+
+    // Binary garbage, NUL bytes, a missing final line end: no crash.
+    std::string garbage("7,E,0ok\n\x01\x02\0\xff,,,\n9", 20);
+    testing::internal::CaptureStderr();
+    msg.reset(); // every OxMsg stops the subsystem when it goes
+    msg = start(garbage.c_str(), nullptr);
+    testing::internal::GetCapturedStderr();
+    EXPECT_EQ(std::string(OxMsg::LogToString(7u)), "ok");
+    std::string truncated("8,E", 3);
+    testing::internal::CaptureStderr();
+    msg.reset(); // every OxMsg stops the subsystem when it goes
+    msg = start(truncated.c_str(), nullptr);
+    testing::internal::GetCapturedStderr();
+    EXPECT_EQ(OxMsg::isValid(), OxTrue);
+}
+
+TEST_F(OxMsgTest, StartUpFailuresAndLookup) {
+    // Logging before any subsystem started does nothing, silently.
+    testing::internal::CaptureStderr();
+    OxMsg::Log(1u, "x");
+    OxMsg::Log("text");
+    EXPECT_EQ(testing::internal::GetCapturedStderr(), "");
+
+    testing::internal::CaptureStderr();
+    { OxMsg missing(nullptr, nullptr, nullptr, nullptr); }
+    EXPECT_EQ(testing::internal::GetCapturedStderr(), "Message file name is NULL.\n");
+
+    std::string cwd = std::filesystem::current_path().string();
+    testing::internal::CaptureStderr();
+    {
+        OxMsg absent("absent.msg", dir.path().c_str(), nullptr, nullptr);
+        EXPECT_EQ(OxMsg::isValid(), OxFalse);
+        OxMsg::Log("nothing");
+    }
+    EXPECT_EQ(testing::internal::GetCapturedStderr(),
+              "Unable to open absent.msg\nTried " + dir.path() +
+                  "/absent.msg and absent.msg,\nin current working directory, " + cwd + "\n");
+
+    // A relative name is found in the directory argument, and the working
+    // directory comes first when both have it.
+    oxtest::TempDir other;
+    oxtest::writeFile(other.file("app.msg"), "1,I,0from the directory\n");
+    {
+        OxMsg fromDir(" app.msg ", other.path().c_str(), nullptr, nullptr);
+        EXPECT_EQ(std::string(OxMsg::LogToString(1u)), "from the directory");
+    }
+    oxtest::writeFile(dir.file("app.msg"), "1,I,0from the working directory\n");
+    std::filesystem::current_path(dir.path());
+    {
+        OxMsg fromCwd("app.msg", other.path().c_str(), nullptr, nullptr);
+        EXPECT_EQ(std::string(OxMsg::LogToString(1u)), "from the working directory");
+    }
+    std::filesystem::current_path(cwd);
+
+    testing::internal::CaptureStderr();
+    {
+        oxtest::writeFile(dir.file("test.msg"), kMessages);
+        OxMsg badLog(dir.file("test.msg").c_str(), nullptr, "run.log",
+                     (dir.path() + "/no/such/dir").c_str());
+        EXPECT_EQ(OxMsg::isValid(), OxFalse);
+    }
+    EXPECT_EQ(testing::internal::GetCapturedStderr(),
+              " Unable to open " + dir.path() + "/no/such/dir/run.log\n");
+}
