@@ -165,7 +165,8 @@ TEST_F(OxMsgTest, BadMessageFilesKeepWhatWasRead) {
     testing::internal::GetCapturedStderr();
 
     // Binary garbage, NUL bytes, a missing final line end: no crash.
-    std::string garbage("7,E,0ok\n\x01\x02\0\xff,,,\n9", 20);
+    const char raw[] = "7,E,0ok\n\x01\x02\0\xff,,,\n9";
+    std::string garbage(raw, sizeof raw - 1);
     testing::internal::CaptureStderr();
     msg.reset(); // every OxMsg stops the subsystem when it goes
     msg = start(garbage.c_str(), nullptr);
