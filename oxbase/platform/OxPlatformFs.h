@@ -1,0 +1,78 @@
+// OxPlatformFs.h: the file-system calls of the library, in one place.
+//
+// Everything in OxBase that touches the file system (status, directories,
+// removal, working directory, opening file streams) goes through these small
+// functions. Every path argument may be in Windows form: on POSIX each
+// backslash is handed to the operating system as '/'. Functions that answer
+// an int follow the C convention (0 success, -1 failure with errno set).
+//
+//   OxStat status;
+//   if (OxPlatformStat("data\\parts", &status) == 0 && OxPlatformIsDirectoryMode(status)) { ... }
+//   std::ifstream * in = OxPlatformOpenInput("data\\parts\\a.bin", true);
+#ifndef OXBASE_PLATFORM_OXPLATFORMFS_H
+#define OXBASE_PLATFORM_OXPLATFORMFS_H
+
+#include <cstdint>
+#include <fstream>
+#include <string>
+
+#include <sys/stat.h>
+#include <sys/types.h>
+
+/// The file status record of the platform: `struct _stat64i32` on Windows,
+/// `struct stat` on POSIX.
+#ifdef _WIN32
+typedef struct _stat64i32 OxStat;
+#else
+typedef struct stat OxStat;
+#endif
+
+/// Type bits of a status mode (mask 0xf000) and their directory and regular
+/// file values, the same numbers on both platforms.
+constexpr unsigned int OxStatTypeMask = 0xf000u;
+constexpr unsigned int OxStatTypeDirectory = 0x4000u;
+constexpr unsigned int OxStatTypeRegular = 0x8000u;
+
+/// File status of `path`, following symbolic links. 0 on success, else -1
+/// with errno set (a null path fails with ENOENT).
+int OxPlatformStat(const char* path, OxStat* status);
+/// The mode field of a status record.
+unsigned int OxPlatformStatMode(const OxStat& status);
+/// Device and inode numbers, widened to 64 bits.
+std::uint64_t OxPlatformStatDevice(const OxStat& status);
+std::uint64_t OxPlatformStatInode(const OxStat& status);
+/// Whether the type bits of the mode say directory / regular file.
+bool OxPlatformIsDirectoryMode(const OxStat& status);
+bool OxPlatformIsRegularMode(const OxStat& status);
+
+/// Creates one directory level (mode 0777 less the umask on POSIX).
+int OxPlatformMkdir(const char* path);
+/// Removes a file name (`_unlink` / `unlink`).
+int OxPlatformUnlink(const char* path);
+/// Removes a file (`remove`).
+int OxPlatformRemove(const char* path);
+/// Changes the working directory of the process.
+int OxPlatformChdir(const char* path);
+/// The working directory of `drive` (0 the current drive, 1 is A) into
+/// `buffer` of `size` characters; `buffer` on success, null with errno set on
+/// failure. POSIX has no drives: the argument is ignored there.
+char* OxPlatformGetDriveCwd(char* buffer, int size, unsigned int drive);
+/// The current drive, 1 being A; 0 on POSIX, which has none.
+unsigned int OxPlatformGetDrive();
+
+/// The current errno, and a way to set it.
+int OxPlatformErrno();
+void OxPlatformSetErrno(int value);
+/// The system's text for an error number.
+std::string OxPlatformErrorText(int errorNumber);
+/// Writes `prefix`, ": " and the text of errno to standard error.
+void OxPlatformPerror(const char* prefix);
+
+/// A new input / output file stream on `path` that other processes may read
+/// and write meanwhile, in binary mode when `binary`, else text mode. The
+/// output stream truncates. Never null; the caller tests the stream's state
+/// and deletes it.
+std::ifstream* OxPlatformOpenInput(const char* path, bool binary);
+std::ofstream* OxPlatformOpenOutput(const char* path, bool binary);
+
+#endif
