@@ -1,0 +1,54 @@
+// OxByteOrder.h: the byte reversal behind the library's big-endian layout.
+//
+// Internal to the stream classes (OxInput, OxOutput, OxMemory). Values are
+// moved through fixed-width unsigned integers with memcpy, so no object is
+// ever read through a pointer of another type, and the shifts below compile
+// to a single byte-swap instruction on the usual compilers.
+//
+//   std::uint32_t bits; std::memcpy(&bits, bytes, 4);
+//   float value = OxByteOrder::toFloat(OxByteOrder::swap32(bits));
+#ifndef OXBASE_IO_OXBYTEORDER_H
+#define OXBASE_IO_OXBYTEORDER_H
+
+#include <cstdint>
+#include <cstring>
+
+namespace OxByteOrder {
+
+inline std::uint16_t swap16(std::uint16_t v) {
+    return static_cast<std::uint16_t>((v >> 8) | (v << 8));
+}
+
+inline std::uint32_t swap32(std::uint32_t v) {
+    return ((v & 0x000000ffu) << 24) | ((v & 0x0000ff00u) << 8) | ((v & 0x00ff0000u) >> 8) |
+           ((v & 0xff000000u) >> 24);
+}
+
+inline std::uint64_t swap64(std::uint64_t v) {
+    return (static_cast<std::uint64_t>(swap32(static_cast<std::uint32_t>(v))) << 32) |
+           swap32(static_cast<std::uint32_t>(v >> 32));
+}
+
+/// The bytes at `bytes` as an unsigned integer of type T, in host order.
+template <typename T> inline T load(const unsigned char* bytes) {
+    T value;
+    std::memcpy(&value, bytes, sizeof value);
+    return value;
+}
+
+/// `value` stored at `bytes` as it is in memory.
+template <typename T> inline void store(unsigned char* bytes, T value) {
+    std::memcpy(bytes, &value, sizeof value);
+}
+
+/// The value of type To with the bit pattern of `from` (same size).
+template <typename To, typename From> inline To bitCast(From from) {
+    static_assert(sizeof(To) == sizeof(From), "bitCast needs equal sizes");
+    To to;
+    std::memcpy(&to, &from, sizeof to);
+    return to;
+}
+
+} // namespace OxByteOrder
+
+#endif

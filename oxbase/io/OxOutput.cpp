@@ -1,0 +1,243 @@
+#include "oxbase/io/OxOutput.h"
+
+#include "oxbase/diag/OxMsg.h"
+#include "oxbase/io/OxByteOrder.h"
+#include "oxbase/io/OxInput.h"
+#include "oxbase/platform/OxPlatformFs.h"
+#include "oxbase/platform/OxPlatformPath.h"
+
+#include <cstring>
+#include <string>
+
+using OxByteOrder::bitCast;
+using OxByteOrder::store;
+
+namespace {
+
+constexpr int kErrorNoEntry = 2; // ENOENT on every platform the library serves
+
+const char* nameText(const char* name) {
+    return name != nullptr ? name : "";
+}
+
+} // namespace
+
+OxOutput::OxOutput(const char* name, OxFile::FILE_MODE mode) : OxFile(name), stream(nullptr) {
+    const char* text = nameText(filename);
+    // The directory part ends at the last separator ('\\', and '/' on POSIX).
+    const char* last = nullptr;
+    for (const char* c = text; *c != '\0'; c++) {
+        if (OxPlatformIsSeparator(*c)) {
+            last = c;
+        }
+    }
+    if (last != nullptr) {
+        std::string directory(text, static_cast<size_t>(last - text));
+        OxStat status;
+        if (OxPlatformStat(directory.c_str(), &status) != 0) {
+            if (OxPlatformErrno() == kErrorNoEntry && OxPlatformMkdir(directory.c_str()) != 0) {
+                std::string error = OxPlatformErrorText(OxPlatformErrno());
+                OxMsg::Log(180, directory.c_str(), error.c_str());
+                return;
+            }
+        } else if (!OxPlatformIsDirectoryMode(status)) {
+            OxMsg::Log(181, directory.c_str());
+            return;
+        } else if (OxPlatformStat(text, &status) == 0 && OxPlatformRemove(text) != 0) {
+            OxMsg::Log(182, text);
+            return;
+        }
+    }
+    stream = OxPlatformOpenOutput(text, mode == FILE_MODE_BINARY);
+    if (!stream->good()) {
+        OxMsg::Log(1, text);
+        readState();
+        delete stream;
+        stream = nullptr;
+    }
+}
+
+OxOutput::~OxOutput() {
+    if (stream != nullptr) {
+        stream->close();
+        delete stream;
+    }
+}
+
+OxBool OxOutput::writeValueBytes(const unsigned char* bytes, unsigned int size) {
+    const char* text = nameText(filename);
+    if (stream == nullptr) {
+        OxMsg::Log(179, text);
+        return OxFalse;
+    }
+    if (!stream->good()) {
+        OxMsg::Log(179, text);
+        readState();
+        return OxFalse;
+    }
+    stream->write(reinterpret_cast<const char*>(bytes), static_cast<std::streamsize>(size));
+    if (!stream->good()) {
+        OxMsg::Log(179, text);
+        readState();
+        return OxFalse;
+    }
+    return OxTrue;
+}
+
+OxBool OxOutput::write(char value) {
+    unsigned char bytes[1] = {static_cast<unsigned char>(value)};
+    return writeValueBytes(bytes, 1);
+}
+
+OxBool OxOutput::write(unsigned char value) {
+    return writeValueBytes(&value, 1);
+}
+
+OxBool OxOutput::write(short value) {
+    unsigned char bytes[2];
+    store(bytes, OxByteOrder::swap16(bitCast<std::uint16_t>(value)));
+    return writeValueBytes(bytes, 2);
+}
+
+OxBool OxOutput::write(unsigned short value) {
+    unsigned char bytes[2];
+    store(bytes, OxByteOrder::swap16(value));
+    return writeValueBytes(bytes, 2);
+}
+
+OxBool OxOutput::write(int value) {
+    unsigned char bytes[4];
+    store(bytes, OxByteOrder::swap32(bitCast<std::uint32_t>(value)));
+    return writeValueBytes(bytes, 4);
+}
+
+OxBool OxOutput::write(unsigned int value) {
+    unsigned char bytes[4];
+    store(bytes, OxByteOrder::swap32(value));
+    return writeValueBytes(bytes, 4);
+}
+
+OxBool OxOutput::write(float value) {
+    unsigned char bytes[4];
+    store(bytes, swapf(value));
+    return writeValueBytes(bytes, 4);
+}
+
+OxBool OxOutput::write(double value) {
+    unsigned char bytes[8];
+    store(bytes, swapd(value));
+    return writeValueBytes(bytes, 8);
+}
+
+OxBool OxOutput::writeBlock(const char* buffer, long long length) {
+    const char* text = nameText(filename);
+    // The stream takes the length as a signed 32-bit count.
+    std::int32_t count = static_cast<std::int32_t>(static_cast<std::uint32_t>(length));
+    if (stream == nullptr || count < 0 || (buffer == nullptr && count != 0)) {
+        OxMsg::Log(179, text);
+        return OxFalse;
+    }
+    stream->write(buffer, static_cast<std::streamsize>(count));
+    if (!stream->good()) {
+        OxMsg::Log(179, text);
+        readState();
+        return OxFalse;
+    }
+    return OxTrue;
+}
+
+OxBool OxOutput::write(char* buffer, long long length) {
+    return writeBlock(buffer, length);
+}
+
+OxBool OxOutput::write(unsigned char* buffer, long long length) {
+    return writeBlock(reinterpret_cast<const char*>(buffer), length);
+}
+
+OxBool OxOutput::write(const char* buffer, long long length) {
+    return writeBlock(buffer, length);
+}
+
+OxBool OxOutput::write(const unsigned char* buffer, long long length) {
+    return writeBlock(reinterpret_cast<const char*>(buffer), length);
+}
+
+OxBool OxOutput::putline(const char* text) {
+    if (text == nullptr) {
+        return OxTrue;
+    }
+    if (stream == nullptr) {
+        OxMsg::Log(179, nameText(filename));
+        return OxFalse;
+    }
+    stream->write(text, static_cast<std::streamsize>(std::strlen(text)));
+    stream->put('\n');
+    stream->flush();
+    if (!stream->good()) {
+        OxMsg::Log(179, nameText(filename));
+        readState();
+        return OxFalse;
+    }
+    return OxTrue;
+}
+
+OxBool OxOutput::putline(const unsigned char* text) {
+    return putline(reinterpret_cast<const char*>(text));
+}
+
+OxBool OxOutput::isGood() const {
+    return OxToBool(stream != nullptr && stream->good());
+}
+
+std::fpos<int> OxOutput::getFilePosition() const {
+    if (stream == nullptr) {
+        return std::fpos<int>(std::streamoff(-1));
+    }
+    return std::fpos<int>(std::streamoff(stream->tellp()));
+}
+
+OxBool OxOutput::seek(int offset, unsigned int direction) {
+    if (stream == nullptr) {
+        return OxFalse;
+    }
+    std::ios_base::seekdir way;
+    switch (direction) {
+    case 0:
+        way = std::ios_base::beg;
+        break;
+    case 1:
+        way = std::ios_base::cur;
+        break;
+    case 2:
+        way = std::ios_base::end;
+        break;
+    default:
+        OxMsg::Log(179, nameText(filename));
+        return OxFalse;
+    }
+    std::streampos position = stream->rdbuf()->pubseekoff(offset, way, std::ios_base::out);
+    return OxToBool(position != std::streampos(std::streamoff(-1)));
+}
+
+std::ostrstream* OxOutput::dump(std::ostrstream* out) const {
+    if (out != nullptr) {
+        *out << "OxOutput (Binary File):" << '\n';
+    }
+    return out;
+}
+
+void OxOutput::readState() const {
+    if (stream == nullptr) {
+        return;
+    }
+    std::ios_base::iostate state = stream->rdstate();
+    if ((state & std::ios_base::eofbit) != 0) {
+        OxMsg::Log(18);
+    }
+    if ((state & std::ios_base::failbit) != 0) {
+        OxMsg::Log(19);
+    }
+    if ((state & std::ios_base::badbit) != 0) {
+        OxMsg::Log(20);
+    }
+}
