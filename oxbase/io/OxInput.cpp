@@ -83,19 +83,18 @@ bool OxInput::readValueBytes(unsigned char* bytes, unsigned int size, long long&
         readState();
         return false;
     }
-    stream->read(reinterpret_cast<char*>(bytes), static_cast<std::streamsize>(size));
-    long long delivered = static_cast<long long>(stream->gcount());
-    if (!stream->good()) {
+    // What istream::read does, without its sentry: the state is known to be
+    // clean and the stream has no tie, so only the buffer read remains.
+    long long delivered = static_cast<long long>(
+        stream->rdbuf()->sgetn(reinterpret_cast<char*>(bytes), static_cast<std::streamsize>(size)));
+    if (delivered != static_cast<long long>(size)) {
+        stream->setstate(std::ios_base::eofbit | std::ios_base::failbit);
         OxMsg::Log(2, text);
         readState();
         result = delivered;
         return false;
     }
     result = size;
-    if (delivered != static_cast<long long>(size)) {
-        OxMsg::Log(3, text);
-        return false;
-    }
     return true;
 }
 
