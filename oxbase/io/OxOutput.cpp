@@ -75,7 +75,12 @@ OxBool OxOutput::writeValueBytes(const unsigned char* bytes, unsigned int size) 
         readState();
         return OxFalse;
     }
-    stream->write(reinterpret_cast<const char*>(bytes), static_cast<std::streamsize>(size));
+    // What ostream::write does, without its sentry: the state is known to be
+    // clean and the stream has no tie, so only the buffer write remains.
+    std::streamsize count = static_cast<std::streamsize>(size);
+    if (stream->rdbuf()->sputn(reinterpret_cast<const char*>(bytes), count) != count) {
+        stream->setstate(std::ios_base::badbit);
+    }
     if (!stream->good()) {
         OxMsg::Log(179, text);
         readState();

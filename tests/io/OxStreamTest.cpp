@@ -254,6 +254,13 @@ TEST_F(IoTest, BadInputIsReportedNotFatal) {
     EXPECT_EQ(messages, (std::vector<std::string>{"m1 " + missing, "m19"}));
     messages.clear();
 
+    OxInput unnamed(nullptr, kBinary);
+    OxOutput nameless("", kBinary);
+    EXPECT_EQ(unnamed.isGood(), OxFalse);
+    EXPECT_EQ(nameless.isGood(), OxFalse);
+    EXPECT_EQ(nameless.write(1), OxFalse);
+    EXPECT_EQ(taken(), (Numbers{"1", "19", "1", "19", "179"}));
+
     OxInput folder(dir.path().c_str(), kBinary); // a directory is no file
     EXPECT_EQ(folder.isGood(), OxFalse);
     EXPECT_EQ(taken(), (Numbers{"1", "19"}));
