@@ -12,6 +12,7 @@
 #include "oxbase/core/OxString.h"
 #include "oxbase/diag/OxMsg.h"
 #include "oxbase/diag/OxPrt.h"
+#include "oxbase/doc/OxXmlAttribute.h"
 // @@STATICS-INCLUDES@@
 
 // 1. The identity matrix.
@@ -30,4 +31,4 @@ OxPrt OxString::conversionPrt;
 // @@STATIC-5-NAMES@@
 
 // 7. The print object of the attribute value conversions.
-// @@STATIC-7-ATTRIBUTE@@
+OxPrt OxXmlAttribute::conversionPrt;

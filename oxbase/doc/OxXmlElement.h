@@ -1,0 +1,134 @@
+// OxXmlElement.h: the node of the document model.
+//
+// An element has a name, attributes, child elements and a text value. A node
+// without a name holds a declaration, comment, CDATA section or DOCTYPE as raw
+// text in its value. An element owns its strings, attributes and children;
+// trees of any depth are destroyed, dumped and written without recursion.
+//
+//   OxXmlElement * part = new OxXmlElement("part");
+//   part->addAttribute(new OxXmlAttribute("vec3d", OxVec3d(1, 2, 3)));
+//   OxVec3d p;  part->getPoint(p);   // (1, 2, 3)
+#ifndef OXBASE_DOC_OXXMLELEMENT_H
+#define OXBASE_DOC_OXXMLELEMENT_H
+
+#include "oxbase/core/OxGList.h"
+#include "oxbase/core/OxTypes.h"
+#include "oxbase/doc/OxXmlAttribute.h"
+
+#include <cstdint>
+
+class OxXmlFile;
+
+class OxXmlElement {
+public:
+    /// What a node stands for. Nothing branches on it: a raw node is told
+    /// from an element by having no name.
+    enum XML_ELEMENT_TYPE : std::int32_t {
+        XML_TYPE_ELEMENT = 1,
+        XML_TYPE_DECLARATION = 2,
+        XML_TYPE_COMMENT = 3, ///< comments and CDATA sections
+        XML_TYPE_DOCTYPE = 4
+    };
+
+    /// An element named by a trimmed copy of `name` (null for null or empty).
+    explicit OxXmlElement(char const* name);
+    OxXmlElement(XML_ELEMENT_TYPE type, char const* name);
+    OxXmlElement(const OxXmlElement&) = delete;
+    OxXmlElement& operator=(const OxXmlElement&) = delete;
+    /// Frees the strings and deletes every attribute and the whole subtree
+    /// (without recursion, so any depth is safe). Does not touch `parent`.
+    virtual ~OxXmlElement();
+
+    // ---- Tree ----
+
+    /// Appends `attribute` (null too); the element takes ownership.
+    void addAttribute(OxXmlAttribute* attribute);
+    /// Appends `child` (null too); the element takes ownership. The child's
+    /// parent is not set: that is setParent.
+    void addChild(OxXmlElement* child);
+    void setParent(OxXmlElement* newParent) { parent = newParent; }
+    OxXmlElement* getParent() const { return parent; }
+    /// Deletes the child at `index` and leaves a null slot (the length stays).
+    /// OxTrue with no children at all or on a null slot; OxFalse for an index
+    /// not below the length.
+    OxBool deleteChild(unsigned int index);
+    /// Deletes every child named exactly `childName`, then removes all null
+    /// slots, keeping the order of the rest. Always OxTrue.
+    OxBool deleteChildren(char const* childName);
+
+    // ---- Reading ----
+
+    char const* getName() const { return name; }
+    char const* getValue() const { return value; }
+    char const* getXsiType() const { return xsiType; }
+    XML_ELEMENT_TYPE getType() const { return type; }
+    /// List lengths, null slots counted; 0 without a list.
+    unsigned int getNbAttributes() const;
+    unsigned int getNbChildElements() const;
+    /// The entry at `index`, or null (no list, index not below the length,
+    /// or a null slot).
+    OxXmlAttribute* getAttribute(unsigned int index) const;
+    OxXmlElement* getChild(unsigned int index) const;
+    /// The first attribute named exactly `attributeName` (case matters), or null.
+    OxXmlAttribute* getAttributeByName(char const* attributeName) const;
+    /// Its value, or null.
+    char const* getAttributeValue(char const* attributeName) const;
+    /// The first child named exactly `childName`, or null.
+    OxXmlElement* getChildByName(char const* childName) const;
+    /// All children named exactly `childName`, in order; the list owns nothing.
+    OxGList<OxXmlElement const*> getChildrenByName(char const* childName) const;
+    /// Whether both names exist and are equal.
+    OxBool isNamed(char const* otherName) const;
+    /// Whether the attribute exists with the value "yes" exactly.
+    OxBool isYes(char const* attributeName) const;
+
+    // ---- Writing ----
+
+    /// Each replaces its text by a trimmed copy (null or empty: none).
+    void setName(char const* newName);
+    void setValue(char const* newValue);
+    void setXsiType(char const* newType);
+
+    // ---- Typed getters ----
+    //
+    // The value is split on blanks and tabs; each token is trimmed and read
+    // by atof (atol for indices): text that is no number counts as 0. A
+    // missing attribute or one without value is no failure: OxTrue, output
+    // untouched. Too few numbers: OxFalse, output untouched. Extra numbers
+    // are ignored.
+
+    /// Three numbers of "color", set by OxColor::setColor.
+    OxBool getColor(OxColor& color) const;
+    /// Every number of "indices", appended to `indices` (a null list: OxTrue).
+    /// OxFalse when the value holds no number at all.
+    OxBool getIndices(OxGList<unsigned int>* indices) const;
+    /// Two, three or four numbers of "vec2d", "vec3d" or "vec4d".
+    OxBool getPoint(OxVec2d& point) const;
+    OxBool getPoint(OxVec3d& point) const;
+    OxBool getPoint(OxVec4d& point) const;
+    /// Two, three or four numbers of the named attribute (null name: OxFalse).
+    OxBool getPoint(char const* attributeName, OxVec2d& point) const;
+    OxBool getPoint(char const* attributeName, OxVec3d& point) const;
+    OxBool getPoint(char const* attributeName, OxVec4d& point) const;
+
+    /// The readable form of the node, its attributes and its subtree, by the
+    /// dump convention (without recursion). Returns `stream`.
+    virtual std::ostrstream* dump(std::ostrstream* stream) const;
+
+private:
+    /// Reads up to `count` numbers of attribute `attributeName` into `numbers`.
+    /// 1: all found; 0: attribute or value missing; -1: too few or no copy.
+    int readNumbers(char const* attributeName, double* numbers, unsigned int count) const;
+    /// Writes the node's own lines and attributes (not the children).
+    void dumpNode(std::ostrstream& stream) const;
+
+    XML_ELEMENT_TYPE type;
+    char* xsiType = nullptr;
+    char* name = nullptr;
+    char* value = nullptr;
+    OxXmlElement* parent = nullptr;
+    OxGList<OxXmlElement*>* children = nullptr;
+    OxGList<OxXmlAttribute*>* attributes = nullptr;
+};
+
+#endif
