@@ -6,6 +6,30 @@
 #include <algorithm>
 #include <iomanip>
 
+namespace {
+// Terminates the text of `stream` with one NUL and freezes its buffer. The
+// text stays valid until the stream is thawed and released. A stream in a
+// failed state (a null text was inserted, say) is cleared first, so that the
+// terminator always gets in and the text is never read past its end.
+const char* terminateText(std::ostrstream* stream) {
+    stream->clear();
+    *stream << std::flush << std::ends;
+    stream->freeze(true);
+    char* text = stream->str();
+    std::streamsize length = stream->pcount();
+    if (text == nullptr || length <= 0) {
+        return "";
+    }
+    if (text[length - 1] != '\0') {
+        // The terminator found no room (memory exhausted): give up the last character.
+        text[length - 1] = '\0';
+    }
+    return text;
+}
+
+const char kBlanks[] = "                                         "; // 41 blanks
+} // namespace
+
 char const* const OxPrt::sep_major_top =
     "-------------------------------==<<</|\\>>>==-------------------------------\n";
 char const* const OxPrt::sep_major_bot =
@@ -38,9 +62,7 @@ void OxPrt::newStream() {
 }
 
 void OxPrt::flushPrt() {
-    *str << std::flush << std::ends;
-    str->freeze(true);
-    const char* text = str->str();
+    const char* text = terminateText(str);
     OxMsg::LogForce(text);
     if (callback != nullptr) {
         callback(text, userData);
@@ -51,9 +73,7 @@ void OxPrt::flushPrt() {
 }
 
 char* OxPrt::flushToString() {
-    *str << std::flush << std::ends;
-    str->freeze(true);
-    char* text = OxString::dup(str->str());
+    char* text = OxString::dup(terminateText(str));
     str->freeze(false);
     delete str;
     newStream();
@@ -149,6 +169,9 @@ void OxPrt::printHex(std::ostrstream* stream, const unsigned char* bytes, size_t
 void OxPrtInit() {}
 
 std::ostrstream& oxIndent(std::ostrstream& stream) {
-    stream << std::setw(OxPrt::curpos + 1) << " ";
+    // Written unformatted, so that neither the fill character nor a pending
+    // width of the caller's stream changes the indentation.
+    short depth = std::min<short>(std::max<short>(OxPrt::curpos, 0), 40);
+    stream.write(kBlanks, depth + 1);
     return stream;
 }

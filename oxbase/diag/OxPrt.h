@@ -13,6 +13,7 @@
 #define OXBASE_DIAG_OXPRT_H
 
 #include "oxbase/core/OxTypes.h"
+#include "oxbase/platform/OxStrstream.h"
 
 #include <cstddef>
 
