@@ -418,7 +418,9 @@ template <class Number> char* formatNumber(OxPrt& prt, Number value) {
     return OxString::stripTrailingZeros(text, '\0');
 }
 
-void twoDigits(std::ostrstream* stream, const char* tag, int value) {
+// The fields are widened first: a broken-down time from outside may hold any
+// int, and adding the base year or month must not overflow.
+void twoDigits(std::ostrstream* stream, const char* tag, long long value) {
     *stream << tag;
     if (value < 10) {
         *stream << "0";
@@ -447,8 +449,8 @@ char* OxString::toString(tm* time) {
     std::ostrstream* stream = conversionPrt.getStr();
     stream->setf(std::ios::showpoint);
     stream->precision(9);
-    *stream << std::dec << "_y" << time->tm_year + 1900;
-    twoDigits(stream, "_m", time->tm_mon + 1);
+    *stream << std::dec << "_y" << static_cast<long long>(time->tm_year) + 1900;
+    twoDigits(stream, "_m", static_cast<long long>(time->tm_mon) + 1);
     twoDigits(stream, "_d", time->tm_mday);
     twoDigits(stream, "_h", time->tm_hour);
     twoDigits(stream, "_m", time->tm_min);
