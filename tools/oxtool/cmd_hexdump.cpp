@@ -1,0 +1,86 @@
+// oxtool hexdump: the printHex table of a whole file on standard output.
+//
+//   oxtool hexdump FILE
+//
+// Rows of 16 bytes: the position in hexadecimal, the bytes, and the text
+// column, where bytes outside 0x20..0x7F show as ".". A last row that is not
+// full is padded so that its bar lines up, and followed by an empty line.
+// The file is read in blocks; each block is a whole number of rows, so the
+// output is the same as one printHex over the whole file.
+#include "OxToolCommand.h"
+
+#include "oxbase/diag/OxPrt.h"
+#include "oxbase/platform/OxPlatformPath.h"
+
+#include <algorithm>
+#include <cstdio>
+#include <fstream>
+#include <iostream>
+#include <string>
+#include <vector>
+
+namespace {
+constexpr size_t kBlockSize = 64 * 1024; // a multiple of the row length 16
+
+// Writes the table of at most `limit` bytes of `in` to standard output.
+// False when the stream fails before its end.
+bool hexdump(std::istream& in, size_t limit) {
+    OxPrt prt;
+    std::vector<char> block(kBlockSize);
+    size_t offset = 0;
+    while (offset < limit) {
+        size_t want = std::min(kBlockSize, limit - offset);
+        in.read(block.data(), static_cast<std::streamsize>(want));
+        size_t got = static_cast<size_t>(in.gcount());
+        if (got == 0) {
+            break;
+        }
+        OxPrt::printHex(prt.getStr(), reinterpret_cast<const unsigned char*>(block.data()), got,
+                        offset);
+        char* text = prt.flushToString();
+        if (text != nullptr) {
+            std::fputs(text, stdout);
+            delete[] text;
+        }
+        offset += got;
+        if (got < want) {
+            break;
+        }
+    }
+    std::fflush(stdout);
+    return !in.bad();
+}
+
+int runHexdump(int argc, char** argv) {
+    if (argc != 2) {
+        std::fprintf(stderr, "usage: oxtool hexdump FILE\n");
+        return 2;
+    }
+    std::ifstream in(OxPlatformNativePath(argv[1]), std::ios::in | std::ios::binary);
+    if (!in) {
+        std::fprintf(stderr, "oxtool hexdump: cannot open %s\n", argv[1]);
+        return 1;
+    }
+    if (!hexdump(in, static_cast<size_t>(-1))) {
+        std::fprintf(stderr, "oxtool hexdump: read error in %s\n", argv[1]);
+        return 1;
+    }
+    return 0;
+}
+
+// Demo: the first 64 bytes of the default message file.
+int demoHexdump(const OxToolDemoContext& context) {
+    std::string path = oxtoolJoin(context.dataDir, "oxbase.msg");
+    std::ifstream in(OxPlatformNativePath(path.c_str()), std::ios::in | std::ios::binary);
+    if (!in) {
+        std::fprintf(stderr, "oxtool hexdump: cannot open %s\n", path.c_str());
+        return 1;
+    }
+    std::cout << "---- first 64 bytes of " << path << "\n" << std::flush;
+    return hexdump(in, 64) ? 0 : 1;
+}
+
+OxToolRegistration registration{{"hexdump", "FILE",
+                                 "print the bytes of a file as a hexadecimal table", runHexdump,
+                                 demoHexdump, 20}};
+} // namespace
