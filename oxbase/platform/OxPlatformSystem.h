@@ -1,10 +1,11 @@
 // OxPlatformSystem.h: the runtime and operating-system services behind OxSystem.
 //
-// Each function here is the checked form of one runtime call: on Windows the
-// `_s` call of the runtime, on POSIX the reentrant call with the same failure
-// rule. Functions that answer an int return 0 on success and an errno value
-// (EINVAL, ERANGE, ...) on failure; a failed copy leaves its target
-// NUL-terminated and empty, as the checked runtime calls do.
+// Each function here is the checked form of one runtime call: the `_s` or
+// 64-bit call of the runtime on Windows, the reentrant call on POSIX, with
+// the same failure rule. The copies and the formatting follow that rule in
+// one portable implementation. Functions that answer an int return 0 on
+// success and an errno value (EINVAL, ERANGE, ...) on failure; a failed copy
+// leaves its target NUL-terminated and empty, as the checked runtime calls do.
 //
 //   char name[64];
 //   if (OxPlatformStrcpy(name, sizeof name, text) != 0) { /* did not fit */ }
