@@ -34,9 +34,11 @@ struct HashEntry {
 
 class HashTable {
 public:
-    /// Makes an unusable table: init (or assignment from an initialised
-    /// table) must run before any other operation.
-    HashTable() = default;
+    /// A table with no slots: init (or assignment from an initialised table)
+    /// must run before any other operation. The constructor is constexpr so
+    /// that a static table is set up before any code runs and a later start-up
+    /// step can never undo an init that came first.
+    constexpr HashTable() = default;
     /// Releases the entries and the array; tableSize becomes 0.
     ~HashTable();
 

@@ -13,6 +13,7 @@
 #include "oxbase/diag/OxMsg.h"
 #include "oxbase/diag/OxPrt.h"
 #include "oxbase/doc/OxXmlAttribute.h"
+#include "oxbase/core/OxName.h"
 // @@STATICS-INCLUDES@@
 
 // 1. The identity matrix.
@@ -28,7 +29,28 @@ OxPrt OxPrt::tracePrt;
 OxPrt OxString::conversionPrt;
 
 // 5./6. The table of names and its tear-down.
-// @@STATIC-5-NAMES@@
+// The table is constant-initialised (no slots); the guard below gives it its
+// 13 slots once, whatever number of guards run, and the table's destructor,
+// registered with its definition, releases it at unload after the guard.
+HashTable OxName::table;
+
+namespace {
+std::uint16_t oxNameTableUseCount = 0;
+} // namespace
+
+class OxNameTableGuard {
+public:
+    OxNameTableGuard() {
+        if (oxNameTableUseCount++ == 0 && OxName::table.getTableSize() == 0) {
+            OxName::table.init();
+        }
+    }
+    ~OxNameTableGuard() { --oxNameTableUseCount; }
+    OxNameTableGuard(const OxNameTableGuard&) = delete;
+    OxNameTableGuard& operator=(const OxNameTableGuard&) = delete;
+};
+
+static OxNameTableGuard oxNameTableGuard;
 
 // 7. The print object of the attribute value conversions.
 OxPrt OxXmlAttribute::conversionPrt;
