@@ -1,0 +1,353 @@
+// Corpus generation: XML model in the writer's layout, a one-comment XML
+// document, a CSV table with empty fields, big-endian doubles, a directory
+// tree and the bench message file.
+#include "OxBenchCorpus.h"
+
+#include <cstdint>
+#include <cstdio>
+#include <cstdlib>
+#include <cstring>
+#include <fstream>
+#include <string>
+
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+namespace oxbench {
+
+namespace {
+
+// A small deterministic generator, so that every run reads the same bytes.
+struct Lcg {
+    std::uint64_t state = 0x2545F4914F6CDD1DULL;
+    std::uint32_t next() {
+        state = state * 6364136223846793005ULL + 1442695040888963407ULL;
+        return static_cast<std::uint32_t>(state >> 33);
+    }
+    // A multiple of 1/steps in [low, high).
+    double grid(double low, double high, int steps) {
+        int cells = static_cast<int>((high - low) * steps);
+        return low + static_cast<double>(next() % static_cast<std::uint32_t>(cells)) / steps;
+    }
+};
+
+// Appends to a string and hands it to the file every megabyte, so the
+// generator itself stays small in memory.
+class Sink {
+public:
+    explicit Sink(const std::string& path) : file(std::fopen(path.c_str(), "wb")) {}
+    ~Sink() { close(); }
+    bool good() const { return file != nullptr && !failed; }
+    std::uint64_t size() const { return written + text.size(); }
+    Sink& operator<<(const std::string& s) {
+        text += s;
+        spill();
+        return *this;
+    }
+    Sink& operator<<(const char* s) {
+        text += s;
+        spill();
+        return *this;
+    }
+    Sink& operator<<(long long v) {
+        text += std::to_string(v);
+        spill();
+        return *this;
+    }
+    bool close() {
+        if (file != nullptr) {
+            flush();
+            failed = std::fclose(file) != 0 || failed;
+            file = nullptr;
+        }
+        return !failed;
+    }
+
+private:
+    void spill() {
+        if (text.size() >= (1u << 20)) {
+            flush();
+        }
+    }
+    void flush() {
+        if (file != nullptr && !text.empty()) {
+            failed = std::fwrite(text.data(), 1, text.size(), file) != text.size() || failed;
+            written += text.size();
+            text.clear();
+        }
+    }
+    std::FILE* file;
+    std::string text;
+    std::uint64_t written = 0;
+    bool failed = false;
+};
+
+std::string blanks(int n) {
+    return std::string(static_cast<std::size_t>(n), ' ');
+}
+
+// The list form of an attribute value: one blank between values, and after
+// every eleventh value a line end and a blank.
+template <typename T, typename F> std::string listText(const T* values, int count, F spell) {
+    std::string text;
+    for (int i = 0; i < count; i++) {
+        if (i > 0) {
+            text += i % 11 == 0 ? "\n " : " ";
+        }
+        text += spell(values[i]);
+    }
+    return text;
+}
+
+std::string vec3Text(Lcg& rng) {
+    return numberText(rng.grid(-500, 500, 8)) + " " + numberText(rng.grid(-500, 500, 8)) + " " +
+           numberText(rng.grid(-500, 500, 8));
+}
+
+bool writeXmlModel(const std::string& path, std::uint64_t target) {
+    Sink out(path);
+    Lcg rng;
+    out << "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n\n";
+    out << "<model name=\"oxbench\" units=\"mm\">\n";
+    unsigned int indices[66];
+    double normals[33];
+    for (long long a = 0; out.size() < target; a++) {
+        out << blanks(1) << "<assembly name=\"A" << a
+            << "\" matrix=\"1.0 0.0 0.0 0.0 1.0 0.0 0.0 0.0 1.0\">\n";
+        for (int b = 0; b < 4; b++) {
+            std::string asmName = "A" + std::to_string(a) + "." + std::to_string(b);
+            out << blanks(2) << "<assembly name=\"" << asmName << "\">\n";
+            for (int p = 0; p < 4; p++) {
+                std::string partName = asmName + "." + std::to_string(p);
+                out << blanks(3) << "<part name=\"P" << partName << "\" color=\""
+                    << numberText(rng.grid(0, 1, 16)) << " " << numberText(rng.grid(0, 1, 16))
+                    << " " << numberText(rng.grid(0, 1, 16)) << "\">\n";
+                out << blanks(4) << "<label>Bracket " << partName << "</label>\n";
+                for (int k = 0; k < 8; k++) {
+                    out << blanks(4) << "<point vec3d=\"" << vec3Text(rng) << "\"/>\n";
+                }
+                for (int k = 0; k < 66; k++) {
+                    indices[k] = rng.next() % 5000;
+                }
+                out << blanks(4) << "<face indices=\""
+                    << listText(indices, 66, [](unsigned int v) { return std::to_string(v); })
+                    << "\"/>\n";
+                for (int k = 0; k < 33; k++) {
+                    normals[k] = rng.grid(-1, 1, 64);
+                }
+                out << blanks(4) << "<normals value_list=\""
+                    << listText(normals, 33, [](double v) { return numberText(v); }) << "\"/>\n";
+                out << blanks(3) << "</part>\n";
+            }
+            out << blanks(2) << "</assembly>\n";
+        }
+        out << blanks(1) << "</assembly>\n";
+    }
+    out << "</model>\n";
+    return out.close();
+}
+
+bool writeXmlComment(const std::string& path, std::uint64_t target) {
+    Sink out(path);
+    Lcg rng;
+    out << "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n\n";
+    out << "<!-- generated notes of a translation run\n";
+    static const char* words[] = {"assembly", "part",  "face",    "edge",  "tolerance", "colour",
+                                  "matrix",   "point", "indices", "layer", "shell",     "loop"};
+    for (long long line = 0; out.size() < target; line++) {
+        std::string text = " note " + std::to_string(line) + ":";
+        while (text.size() < 90) {
+            text += " ";
+            text += words[rng.next() % 12];
+        }
+        out << text << "\n";
+    }
+    out << "-->\n";
+    out << "<model name=\"comment\"/>\n";
+    return out.close();
+}
+
+bool writeCsv(const std::string& path, std::uint64_t target) {
+    Sink out(path);
+    Lcg rng;
+    out << "id,name,x,y,z,red,green,blue,layer,note\n";
+    static const char* notes[] = {"ok", "check", "reworked", "imported", "mirrored"};
+    for (long long row = 0; out.size() < target; row++) {
+        if (row % 5000 == 0) {
+            out << "# block " << row / 5000 << "\n";
+        }
+        std::string fields[10];
+        fields[0] = std::to_string(row);
+        fields[1] = "part_" + std::to_string(row);
+        for (int k = 2; k < 5; k++) {
+            fields[k] = numberText(rng.grid(-500, 500, 8));
+        }
+        for (int k = 5; k < 8; k++) {
+            fields[k] = numberText(rng.grid(0, 1, 16));
+        }
+        fields[8] = std::to_string(rng.next() % 64);
+        fields[9] = notes[rng.next() % 5];
+        // About one field in six is empty; the id never is.
+        for (int k = 1; k < 10; k++) {
+            if (rng.next() % 6 == 0) {
+                fields[k].clear();
+            }
+        }
+        std::string line = fields[0];
+        for (int k = 1; k < 10; k++) {
+            line += ",";
+            line += fields[k];
+        }
+        out << line << "\n";
+    }
+    return out.close();
+}
+
+bool writeDoubles(const std::string& path, std::size_t count) {
+    std::FILE* file = std::fopen(path.c_str(), "wb");
+    if (file == nullptr) {
+        return false;
+    }
+    std::uint64_t block[8192];
+    bool ok = true;
+    for (std::size_t i = 0; i < count && ok;) {
+        std::size_t n = 0;
+        for (; n < 8192 && i < count; n++, i++) {
+            double value = static_cast<double>(i) * 0.5 - 1000.25;
+            std::uint64_t bits;
+            std::memcpy(&bits, &value, 8);
+            block[n] = byteSwap64(bits);
+        }
+        ok = std::fwrite(block, 8, n, file) == n;
+    }
+    return std::fclose(file) == 0 && ok;
+}
+
+bool makeDir(const std::string& path) {
+    return mkdir(path.c_str(), 0755) == 0;
+}
+
+bool touch(const std::string& path) {
+    int fd = open(path.c_str(), O_CREAT | O_WRONLY | O_TRUNC, 0644);
+    if (fd < 0) {
+        return false;
+    }
+    return close(fd) == 0;
+}
+
+// 10 top directories, 10 below each, 29 below each of those (3,010
+// directories); 20 files in each directory of the two lower levels (60,000).
+bool writeTree(const std::string& root, bool quick, std::size_t& entries) {
+    int top = quick ? 1 : 10;
+    entries = 1;
+    if (!makeDir(root)) {
+        return false;
+    }
+    for (int t = 0; t < top; t++) {
+        std::string dt = root + "/dir" + std::to_string(t);
+        if (!makeDir(dt)) {
+            return false;
+        }
+        entries++;
+        for (int m = 0; m < 10; m++) {
+            std::string dm = dt + "/sub" + std::to_string(m);
+            if (!makeDir(dm)) {
+                return false;
+            }
+            entries++;
+            for (int f = 0; f < 20; f++) {
+                if (!touch(dm + "/file" + std::to_string(f) + ".dat")) {
+                    return false;
+                }
+                entries++;
+            }
+            for (int l = 0; l < 29; l++) {
+                std::string dl = dm + "/leaf" + std::to_string(l);
+                if (!makeDir(dl)) {
+                    return false;
+                }
+                entries++;
+                for (int f = 0; f < 20; f++) {
+                    if (!touch(dl + "/part" + std::to_string(f) + ".xml")) {
+                        return false;
+                    }
+                    entries++;
+                }
+            }
+        }
+    }
+    return true;
+}
+
+bool writeMessageFile(const std::string& path) {
+    std::ofstream out(path, std::ios::binary | std::ios::trunc);
+#ifdef OXBENCH_DATA_DIR
+    // The library's own messages first, so that what it logs during a case
+    // has its text.
+    std::ifstream defaults(std::string(OXBENCH_DATA_DIR) + "/oxbase.msg", std::ios::binary);
+    if (defaults) {
+        out << defaults.rdbuf();
+    }
+#endif
+    out << "\n0 ---- oxbench\n" << kBenchMessage << ",I,0" << kBenchMessageText << "\n";
+    return static_cast<bool>(out);
+}
+
+} // namespace
+
+std::string numberText(double value) {
+    if (value < 1e-9 && value > -1e-9) {
+        value = 0.0;
+    }
+    char text[64];
+    std::snprintf(text, sizeof(text), "%.9f", value);
+    std::string s = text;
+    std::size_t point = s.find('.');
+    std::size_t end = s.size();
+    while (end > point + 2 && s[end - 1] == '0') {
+        end--;
+    }
+    s.resize(end);
+    return s;
+}
+
+bool generateCorpus(Corpus& corpus, bool quick, std::string& error) {
+    const char* tmp = std::getenv("TMPDIR");
+    std::string templ = (tmp != nullptr && *tmp != '\0' ? std::string(tmp) : std::string("/tmp")) +
+                        "/oxbench.XXXXXX";
+    std::string buffer = templ;
+    if (mkdtemp(&buffer[0]) == nullptr) {
+        error = "cannot create a temporary directory from " + templ;
+        return false;
+    }
+    corpus.dir = buffer;
+    const std::uint64_t textBytes = quick ? 4000000 : 40000000;
+    corpus.xmlModel = corpus.dir + "/model.xml";
+    corpus.xmlComment = corpus.dir + "/comment.xml";
+    corpus.csvTable = corpus.dir + "/table.csv";
+    corpus.doubles = corpus.dir + "/doubles.bin";
+    corpus.tree = corpus.dir + "/tree";
+    corpus.messageFile = corpus.dir + "/oxbench.msg";
+    corpus.logDir = corpus.dir + "/log";
+    corpus.nbDoubles = quick ? 800000 : 8000000;
+    corpus.nbMessages = quick ? 100000 : 1000000;
+    corpus.rangeRecords = quick ? 10000 : 100000;
+    corpus.rangeMembers = quick ? 1000000 : 10000000;
+    if (!writeXmlModel(corpus.xmlModel, textBytes)) {
+        error = "cannot write " + corpus.xmlModel;
+    } else if (!writeXmlComment(corpus.xmlComment, textBytes)) {
+        error = "cannot write " + corpus.xmlComment;
+    } else if (!writeCsv(corpus.csvTable, textBytes)) {
+        error = "cannot write " + corpus.csvTable;
+    } else if (!writeDoubles(corpus.doubles, corpus.nbDoubles)) {
+        error = "cannot write " + corpus.doubles;
+    } else if (!writeTree(corpus.tree, quick, corpus.treeEntries)) {
+        error = "cannot build the tree below " + corpus.tree;
+    } else if (!writeMessageFile(corpus.messageFile) || !makeDir(corpus.logDir)) {
+        error = "cannot write the message file or log directory";
+    }
+    return error.empty();
+}
+
+} // namespace oxbench
