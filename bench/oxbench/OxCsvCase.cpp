@@ -1,0 +1,45 @@
+// OxBase side of the CSV case: OxCsvFile::readFile of the table into the
+// element tree (one record element per data line).
+#include "OxBench.h"
+
+#include "oxbase/doc/OxCsvFile.h"
+#include "oxbase/doc/OxXmlElement.h"
+#include "oxbase/io/OxFile.h"
+
+#include <memory>
+#include <string>
+
+namespace oxbench {
+namespace {
+
+class OxCsvRead : public Runner {
+public:
+    bool prepare(const Corpus& corpus, std::string&) override {
+        path = corpus.csvTable;
+        return true;
+    }
+    Outcome run() override {
+        file = std::make_unique<OxCsvFile>(path.c_str(), OxFile::OxIOInput);
+        Outcome outcome;
+        outcome.ok = file->readFile() == OxTrue;
+        if (!outcome.ok) {
+            outcome.note = "readFile answered OxFalse";
+        }
+        outcome.amount = static_cast<double>(fileSize(path));
+        return outcome;
+    }
+    void afterRun(Outcome& outcome) override {
+        const OxXmlElement* root = file->getRoot();
+        outcome.check = root != nullptr ? root->getNbChildElements() : 0;
+        file.reset();
+    }
+
+private:
+    std::string path;
+    std::unique_ptr<OxCsvFile> file;
+};
+Registration oxCsvRead("csv-read", "OxBase OxCsvFile::readFile",
+                       [] { return std::make_unique<OxCsvRead>(); });
+
+} // namespace
+} // namespace oxbench
