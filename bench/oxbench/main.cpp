@@ -479,7 +479,11 @@ int main(int argc, char** argv) {
         }
         std::cerr << "oxbench: " << row.caseName << " / " << row.impl << "..." << std::flush;
         RowResult r = runRow(row, corpus, options);
-        std::cerr << " " << (r.status.empty() ? timeText(r.median) : r.status) << "\n";
+        std::cerr << " "
+                  << (!r.status.empty()  ? r.status
+                      : r.peakBytes >= 0 ? fmt("peak %.1f MB", r.peakBytes / 1e6)
+                                         : timeText(r.median))
+                  << "\n";
         results.push_back(r);
     }
 
