@@ -9,6 +9,7 @@
 #include <cstring>
 #include <fstream>
 #include <string>
+#include <vector>
 
 #include <fcntl.h>
 #include <sys/stat.h>
@@ -310,6 +311,31 @@ std::string numberText(double value) {
     }
     s.resize(end);
     return s;
+}
+
+std::vector<std::string> writerLines(const std::string& path) {
+    std::ifstream in(path);
+    std::vector<std::string> lines;
+    std::string line, unit;
+    bool inValue = false;
+    while (std::getline(in, line)) {
+        if (!inValue && line.empty()) {
+            continue;
+        }
+        // A line end inside a value comes back from the reader as the one
+        // blank that begins the next line of the list form.
+        unit += line;
+        for (char c : line) {
+            if (c == '"') {
+                inValue = !inValue;
+            }
+        }
+        if (!inValue) {
+            lines.push_back(std::move(unit));
+            unit.clear();
+        }
+    }
+    return lines;
 }
 
 bool generateCorpus(Corpus& corpus, bool quick, std::string& error) {

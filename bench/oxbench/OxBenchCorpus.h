@@ -7,6 +7,7 @@
 #include "OxBench.h"
 
 #include <string>
+#include <vector>
 
 namespace oxbench {
 
@@ -18,6 +19,12 @@ bool generateCorpus(Corpus& corpus, bool quick, std::string& error);
 /// The number text of the document model: fixed with nine decimals, trailing
 /// zeros cut but one digit kept behind the point ("2.0", "-0.25").
 std::string numberText(double value);
+
+/// The lines the document writer sends for a model in its layout, as the
+/// reader leaves it: one line per element (a list value that spanned several
+/// lines joined by single blanks), and no empty line behind the declaration,
+/// since a document that was read keeps its declaration line as it stood.
+std::vector<std::string> writerLines(const std::string& path);
 
 } // namespace oxbench
 

@@ -3,6 +3,7 @@
 // ofstream with a flush per line (XML write, messages), nftw (walk) and a
 // nested loop over a vector of ranges (range walk).
 #include "OxBench.h"
+#include "OxBenchCorpus.h"
 
 #include <cstdio>
 #include <cstring>
@@ -146,36 +147,6 @@ Registration binaryFread("binary-memory", "fread 1 MiB blocks + swap",
                          [] { return std::make_unique<BinaryFread>(); });
 
 // ---- XML write: ofstream, one flush per line -------------------------------
-
-// The lines the document writer sends for the model: one per element, a
-// start tag whose attribute value spans several lines counting as one, and
-// no empty line behind the declaration (a document that was read keeps its
-// declaration line as it stood).
-std::vector<std::string> writerLines(const std::string& path) {
-    std::ifstream in(path);
-    std::vector<std::string> lines;
-    std::string line, unit;
-    bool inValue = false;
-    while (std::getline(in, line)) {
-        if (!inValue && line.empty()) {
-            continue;
-        }
-        if (inValue) {
-            unit += "\n";
-        }
-        unit += line;
-        for (char c : line) {
-            if (c == '"') {
-                inValue = !inValue;
-            }
-        }
-        if (!inValue) {
-            lines.push_back(std::move(unit));
-            unit.clear();
-        }
-    }
-    return lines;
-}
 
 class XmlWriteOfstream : public Runner {
 public:
