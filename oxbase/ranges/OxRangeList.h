@@ -7,7 +7,7 @@
 //
 //   OxRangeList pages("1-3,10-12", "page");
 //   unsigned int n;
-//   for (OxBool more = pages.getFirstEntry(n); more && n != 0; n = pages.getNextEntry(n)) { ... }
+//   if (pages.getFirstEntry(n)) do { print(n); } while ((n = pages.getNextEntry(n)) != 0);
 //
 // Range text: a series of ranges, each a number or two numbers joined by "-"
 // with nothing between them. One "," or one blank ends a range, and white

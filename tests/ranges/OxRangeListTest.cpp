@@ -72,24 +72,17 @@ struct TreeRangeList : OxRangeList {
 } // namespace
 
 TEST_F(OxRangeListTest, AcceptedTexts) {
+    // clang-format off
     struct Case {
         const char* source;
         const char* records; // list order, as convertToString spells it
     } cases[] = {
-        {"5", "5"},
-        {"3-3", "3"},
-        {"1,2 3", "1,2,3"},
-        {"1, 2", "1,2"},
-        {"1\n2", "1,2"},
-        {"1\r\n2", "1,2"},
-        {"\t1, \t 2-4", "1,2-4"},
-        {"9,1-3,2-4", "9,1-3,2-4"},
-        {"1,2,", "1"},
-        {"  7  ", "7"},
-        {"4294967295", "4294967295"},
-        {"4294967296", "0"},
+        {"5", "5"}, {"3-3", "3"}, {"1,2 3", "1,2,3"}, {"1, 2", "1,2"}, {"1\n2", "1,2"},
+        {"1\r\n2", "1,2"}, {"\t1, \t 2-4", "1,2-4"}, {"9,1-3,2-4", "9,1-3,2-4"}, {"1,2,", "1"},
+        {"  7  ", "7"}, {"4294967295", "4294967295"}, {"4294967296", "0"},
         {"4294967297-4294967298", "1-2"},
     };
+    // clang-format on
     for (const Case& c : cases) {
         OxRangeList list(c.source, nullptr);
         EXPECT_EQ(list.isValid(), OxTrue) << c.source;
@@ -107,21 +100,18 @@ TEST_F(OxRangeListTest, AcceptedTexts) {
 }
 
 TEST_F(OxRangeListTest, RejectedTextsAndTheirPositions) {
+    // clang-format off
     struct Case {
         const char* source;
         const char* message;
     } cases[] = {
-        {"1 , 2", "syntax integer 3 [1 , 2]"},
-        {"1-", "syntax integer 3 [1-]"},
-        {"1-a", "syntax integer 3 [1-a]"},
-        {"-1", "syntax integer 1 [-1]"},
-        {"a", "syntax integer 1 [a]"},
-        {"1\t2", "syntax integer 2 [1\t2]"},
-        {"12,3-4-5", "syntax integer 7 [12,3-4-5]"},
-        {" 1,,2 ", "syntax integer 3 [1,,2]"},
-        {"3-2", "backwards integer 3 2"},
-        {"1,10-9", "backwards integer 10 9"},
+        {"1 , 2", "syntax integer 3 [1 , 2]"}, {"1-", "syntax integer 3 [1-]"},
+        {"1-a", "syntax integer 3 [1-a]"}, {"-1", "syntax integer 1 [-1]"},
+        {"a", "syntax integer 1 [a]"}, {"1\t2", "syntax integer 2 [1\t2]"},
+        {"12,3-4-5", "syntax integer 7 [12,3-4-5]"}, {" 1,,2 ", "syntax integer 3 [1,,2]"},
+        {"3-2", "backwards integer 3 2"}, {"1,10-9", "backwards integer 10 9"},
     };
+    // clang-format on
     for (const Case& c : cases) {
         messages.clear();
         OxRangeList list(c.source, nullptr);
