@@ -1,0 +1,395 @@
+#include "oxbase/doc/OxCsvFile.h"
+
+#include "oxbase/core/OxString.h"
+#include "oxbase/diag/OxMsg.h"
+#include "oxbase/diag/OxPrt.h"
+#include "oxbase/doc/OxXmlAttribute.h"
+#include "oxbase/doc/OxXmlElement.h"
+#include "oxbase/io/OxInput.h"
+#include "oxbase/io/OxOutput.h"
+
+#include <climits>
+#include <cstdio>
+#include <cstring>
+#include <iostream>
+#include <new>
+#include <string>
+
+char const OxCsvFile::OX_CSV_COMMENT_START = '#';
+
+namespace {
+
+/// The smallest line buffer: a line of 1039 characters, its terminator and
+/// one byte of reserve.
+constexpr unsigned long long kMinLineBuffer = 1041;
+
+/// The name of a field behind the last column name: "column<position>".
+void generatedColumnName(char (&name)[24], unsigned int position) {
+    std::snprintf(name, sizeof name, "column%u", position);
+}
+
+char const* nameOf(OxFile const* file) {
+    char const* name = file != nullptr ? file->getFilename() : nullptr;
+    return name != nullptr ? name : "";
+}
+
+} // namespace
+
+OxCsvFile::OxCsvFile(char const* filename, OxFile::OxIOType type) : separator(',') {
+    open(filename, type);
+}
+
+OxCsvFile::OxCsvFile(char const* filename, OxFile::OxIOType type, char fieldSeparator)
+    : separator(fieldSeparator) {
+    open(filename, type);
+}
+
+OxCsvFile::~OxCsvFile() {
+    delete input;
+    delete output;
+    delete root;
+    for (unsigned int i = 0; i < columnNames.getLength(); i++) {
+        delete[] columnNames[i];
+    }
+}
+
+int OxCsvFile::open(char const* filename, OxFile::OxIOType type) {
+    // The streams require a name; a missing one gives a stream that is not
+    // good rather than none, so that isGood and the result tell the caller.
+    char const* name = filename != nullptr ? filename : "";
+    if (type == OxFile::OxIOInput) {
+        delete input;
+        input = new OxInput(name, OxFile::FILE_MODE_TEXT);
+        return input->isGood() == OxTrue ? 0 : -1;
+    }
+    if (type == OxFile::OxIOOutput) {
+        delete output;
+        output = new OxOutput(name, OxFile::FILE_MODE_TEXT);
+        return output->isGood() == OxTrue ? 0 : -1;
+    }
+    return 0;
+}
+
+OxBool OxCsvFile::isGood(OxFile::OxIOType type) const {
+    if (type == OxFile::OxIOInput) {
+        return OxToBool(input != nullptr && input->isGood() == OxTrue);
+    }
+    if (type == OxFile::OxIOOutput) {
+        return OxToBool(output != nullptr && output->isGood() == OxTrue);
+    }
+    return OxFalse;
+}
+
+void OxCsvFile::setColumnNames(OxGList<char*>& names) {
+    for (unsigned int i = 0; i < names.getLength(); i++) {
+        if (names[i] != nullptr) {
+            columnNames.append(OxString::dup(names[i]));
+        }
+    }
+}
+
+void OxCsvFile::setRoot(OxXmlElement* newRoot) {
+    if (newRoot == root) {
+        return;
+    }
+    delete root;
+    root = newRoot;
+}
+
+OxBool OxCsvFile::isComment(char const* line) {
+    return OxToBool(line != nullptr && line[0] == OX_CSV_COMMENT_START);
+}
+
+// ---------------------------------------------------------------------------
+// Reading
+
+OxBool OxCsvFile::readFile() {
+    if (input == nullptr || input->isGood() != OxTrue) {
+        return OxFalse;
+    }
+    if (input->seek(0, 0) != OxTrue) {
+        OxMsg::Log(3, nameOf(input));
+        return OxFalse;
+    }
+    // The buffer holds the longest line the file can have, so that no line is
+    // cut: a line of the stream's getline that fills the buffer would leave
+    // the stream failed and the rest of the file unread. A file of unknown
+    // length falls back to the smallest buffer; a line that overflows it is
+    // then reported below.
+    unsigned long long size = static_cast<unsigned long long>(input->getFileLength()) + 2;
+    if (size < kMinLineBuffer) {
+        size = kMinLineBuffer;
+    }
+    if (size > UINT_MAX) {
+        size = UINT_MAX;
+    }
+    char* line = new (std::nothrow) char[size];
+    if (line == nullptr) {
+        std::cerr << "FATAL: Dynamic storage allocation failure." << std::endl;
+        return OxFalse;
+    }
+    bool headerDone = columnNames.getLength() > 0;
+    setRoot(new OxXmlElement("root"));
+
+    for (;;) {
+        line[0] = '\0';
+        OxBool more = input->getline(line, static_cast<unsigned int>(size - 1), '\n');
+        // A last line without a line end (or the part of a line that did not
+        // fit) is still a line: take it before looking at why the read ended.
+        takeLine(line, headerDone);
+        if (more != OxTrue) {
+            break;
+        }
+    }
+    delete[] line;
+    if (input->eof() != OxTrue) {
+        OxMsg::Log(2, nameOf(input));
+        return OxFalse;
+    }
+    return OxTrue;
+}
+
+void OxCsvFile::takeLine(char* line, bool& headerDone) {
+    OxString::stripWhite(line);
+    if (line[0] == '\0' || isComment(line) == OxTrue) {
+        return;
+    }
+    if (!headerDone) {
+        headerDone = takeHeader(line);
+    } else {
+        takeRecord(line);
+    }
+}
+
+bool OxCsvFile::takeHeader(char* line) {
+    char* start = line;
+    for (char* p = line;; p++) {
+        if (*p == separator) {
+            columnNames.append(OxString::dup(start, static_cast<size_t>(p - start)));
+            start = p + 1;
+        } else if (*p == '\0') {
+            if (p == start) {
+                // The line ends in the separator: more columns follow on the
+                // next line that is not skipped.
+                return false;
+            }
+            columnNames.append(OxString::dup(start, static_cast<size_t>(p - start)));
+            return true;
+        }
+    }
+}
+
+void OxCsvFile::takeRecord(char* line) {
+    OxXmlElement* record = new OxXmlElement("record");
+    root->addChild(record);
+    record->setParent(root);
+    unsigned int position = 0;
+    char* start = line;
+    for (char* p = line;; p++) {
+        bool atEnd = *p == '\0';
+        if (!atEnd && *p != separator) {
+            continue;
+        }
+        if (p != start) {
+            *p = '\0';
+            char generated[24];
+            char const* name;
+            if (position < columnNames.getLength()) {
+                name = columnNames[position];
+            } else {
+                generatedColumnName(generated, position);
+                name = generated;
+            }
+            OxXmlAttribute* attribute = new OxXmlAttribute(name);
+            record->addAttribute(attribute);
+            attribute->setValue(start);
+        }
+        if (atEnd) {
+            return;
+        }
+        position++;
+        start = p + 1;
+    }
+}
+
+// ---------------------------------------------------------------------------
+// Writing
+
+OxBool OxCsvFile::writeFile() {
+    if (output == nullptr || output->isGood() != OxTrue) {
+        return OxFalse;
+    }
+    if (output->seek(0, 0) != OxTrue) {
+        OxMsg::Log(3, nameOf(output));
+        return OxFalse;
+    }
+    std::string text;
+    unsigned int columns = columnNames.getLength();
+    if (columns > 0) {
+        for (unsigned int i = 0; i < columns; i++) {
+            if (i > 0) {
+                text += separator;
+            }
+            if (columnNames[i] != nullptr) {
+                text += columnNames[i];
+            }
+        }
+        output->putline(text.c_str());
+    }
+
+    unsigned int width = columns;
+    unsigned int records = root != nullptr ? root->getNbChildElements() : 0;
+    for (unsigned int r = 0; r < records; r++) {
+        OxXmlElement const* record = root->getChild(r);
+        if (record == nullptr) {
+            continue;
+        }
+        text.clear();
+        unsigned int count = 0;
+        bool first = true;
+        unsigned int attributes = record->getNbAttributes();
+        for (unsigned int a = 0; a < attributes; a++) {
+            OxXmlAttribute const* attribute = record->getAttribute(a);
+            if (attribute == nullptr) {
+                continue;
+            }
+            if (!first) {
+                text += separator;
+            }
+            first = false;
+            char const* value = attribute->getValue();
+            if (value == nullptr) {
+                continue;
+            }
+            text += value;
+            // A value that is a list of fields (see convertToCsv) counts each
+            // of them; a quoted value is one field whatever it holds.
+            count++;
+            if (value[0] != '"') {
+                count += OxString::occurances(value, separator);
+            }
+        }
+        if (width == 0) {
+            width = count;
+        }
+        if (width > count) {
+            text.append(width - count, separator);
+        }
+        output->putline(text.c_str());
+    }
+    OxMsg::LogForce(578, nameOf(output));
+    return OxTrue;
+}
+
+// ---------------------------------------------------------------------------
+// Queries and value preparation
+
+OxXmlElement const* OxCsvFile::find(char const* attributeName, char const* value,
+                                    unsigned int& index) const {
+    if (root == nullptr || attributeName == nullptr) {
+        return nullptr;
+    }
+    unsigned int records = root->getNbChildElements();
+    for (unsigned int r = index; r < records; r++) {
+        OxXmlElement const* record = root->getChild(r);
+        if (record == nullptr) {
+            continue;
+        }
+        OxXmlAttribute const* attribute = record->getAttributeByName(attributeName);
+        if (attribute == nullptr) {
+            continue;
+        }
+        if (value != nullptr &&
+            (attribute->getValue() == nullptr || std::strcmp(attribute->getValue(), value) != 0)) {
+            continue;
+        }
+        index = r;
+        return record;
+    }
+    return nullptr;
+}
+
+void OxCsvFile::convertToCsv(OxXmlAttribute* attribute, OxBool quote) {
+    if (attribute == nullptr || attribute->getValue() == nullptr) {
+        return;
+    }
+    char* value = attribute->getValueForUpdate();
+    OxString::stripWhite(value);
+    if (quote != OxTrue) {
+        OxString::tr(value, ' ', separator, OxTrue);
+        return;
+    }
+    if (std::strchr(value, '"') != nullptr) {
+        std::string quoted(1, '"');
+        for (char const* p = value; *p != '\0'; p++) {
+            quoted += *p;
+            if (*p == '"') {
+                quoted += '"';
+            }
+        }
+        quoted += '"';
+        attribute->setValue(quoted.c_str());
+        return;
+    }
+    if (std::strchr(value, separator) != nullptr) {
+        std::string quoted(1, '"');
+        quoted += value;
+        quoted += '"';
+        attribute->setValue(quoted.c_str());
+    }
+}
+
+OxBool OxCsvFile::parseCSVString(char const* text, char separator, OxGList<char*>& fields) {
+    if (text == nullptr) {
+        return OxFalse;
+    }
+    char* copy = OxString::dup(text);
+    if (copy == nullptr) {
+        return OxTrue; // an empty text has no fields
+    }
+    OxString::stripWhite(copy);
+    char* start = copy;
+    for (char* p = copy;; p++) {
+        bool atEnd = *p == '\0';
+        if (!atEnd && *p != separator) {
+            continue;
+        }
+        if (p != start) {
+            char* field = OxString::dup(start, static_cast<size_t>(p - start));
+            fields.append(OxString::stripWhite(field));
+        }
+        if (atEnd) {
+            break;
+        }
+        start = p + 1;
+    }
+    delete[] copy;
+    return OxTrue;
+}
+
+// ---------------------------------------------------------------------------
+// Dump
+
+std::ostrstream* OxCsvFile::dump(std::ostrstream* stream) const {
+    return dumpCSV(stream);
+}
+
+std::ostrstream* OxCsvFile::dumpCSV(std::ostrstream* stream) const {
+    if (stream == nullptr) {
+        return stream;
+    }
+    oxIndent(*stream) << "OxCsvFile :"
+                      << "\n";
+    if (input != nullptr) {
+        oxIndent(*stream) << "  CSV Input File Name: " << nameOf(input) << "\n";
+    }
+    if (output != nullptr) {
+        oxIndent(*stream) << "  CSV Output File Name: " << nameOf(output) << "\n";
+    }
+    if (root != nullptr) {
+        OxPrt::adjustIndent(2);
+        root->dump(stream);
+        OxPrt::adjustIndent(-2);
+    }
+    return stream;
+}
