@@ -1,0 +1,90 @@
+// OxDirStream.cpp: directory streams over the platform's find handles.
+#include "oxbase/io/OxDirStream.h"
+
+#include "oxbase/diag/OxPrt.h"
+#include "oxbase/platform/OxPlatformDir.h"
+
+#include <cerrno>
+#include <climits>
+#include <cstring>
+#include <iostream>
+#include <new>
+
+namespace {
+
+void setEntry(OxDirStream* stream, const char* name) {
+    stream->d_name = const_cast<char*>(name);
+    size_t length = std::strlen(name);
+    stream->d_namlen = static_cast<short>(length > SHRT_MAX ? SHRT_MAX : length);
+}
+
+} // namespace
+
+OxDirStream* OxDirStream::opendir(const char* name) {
+    if (name == nullptr || name[0] == '\0') {
+        errno = EINVAL;
+        return nullptr;
+    }
+    size_t length = std::strlen(name);
+    bool endsInSeparator = name[length - 1] == '/' || name[length - 1] == '\\';
+    char* pattern = new (std::nothrow) char[length + 3];
+    OxDirStream* stream = new (std::nothrow) OxDirStream;
+    if (pattern == nullptr || stream == nullptr) {
+        delete[] pattern;
+        delete stream;
+        errno = ENOMEM;
+        return nullptr;
+    }
+    std::memcpy(pattern, name, length);
+    std::strcpy(pattern + length, endsInSeparator ? "*" : "/*");
+    stream->pattern = pattern;
+
+    const char* first = nullptr;
+    stream->handle = OxPlatformFindFirst(pattern, &first);
+    if (stream->handle == nullptr) {
+        int saved = errno;
+        if (OxPrt::getTraceThreshold() >= 99) {
+            std::cerr << "opendir: _findfirst failed to locate \"" << pattern << "\"\n"
+                      << std::flush;
+        }
+        delete[] stream->pattern;
+        delete stream;
+        errno = saved;
+        return nullptr;
+    }
+    stream->pending = first; // the platform keeps it until the next call on the handle
+    return stream;
+}
+
+OxDirStream* OxDirStream::readdir(OxDirStream* stream) {
+    if (stream == nullptr) {
+        return nullptr;
+    }
+    if (stream->handle == nullptr) {
+        errno = EBADF;
+        return nullptr;
+    }
+    const char* name = nullptr;
+    if (stream->pending != nullptr) {
+        name = stream->pending;
+        stream->pending = nullptr;
+    } else if (OxPlatformFindNext(stream->handle, &name) != 0) {
+        return nullptr;
+    }
+    setEntry(stream, name);
+    return stream;
+}
+
+int OxDirStream::closedir(OxDirStream* stream) {
+    if (stream == nullptr) {
+        errno = EBADF;
+        return -1;
+    }
+    int result = stream->handle != nullptr ? OxPlatformFindClose(stream->handle) : 0;
+    delete[] stream->pattern;
+    delete stream;
+    if (result == -1) {
+        errno = EBADF;
+    }
+    return result;
+}

@@ -1,0 +1,99 @@
+// OxFileTreeWalk.h: visit a directory tree with a bounded number of open streams.
+//
+// A walk calls a callback for every object below (and including) a start
+// path, a directory before its contents, following symbolic links. However
+// deep the tree, at most `maxStreams` directory streams are open at once:
+// when the ring of stream slots is full, the oldest open directory is read to
+// its end into memory and its stream closed. An inode table keeps the walk
+// from entering a directory twice, so links to ancestors cause no loop.
+//
+//   int count(const char * path, const OxStat *, OxFileTreeWalkType, void * n) { ++*(int *)n;
+//   return 0; } int n = 0; OxFileTreeWalk walk("/data/parts", count, 10, &n); int result =
+//   walk.run();    // 0, the callback's non-zero result, or -1
+//
+// The walk moves the working directory of the process while it runs and
+// restores it at the end; it is for one thread at a time. Failures are
+// reported on standard error (not through OxMsg). A relative start path is
+// made absolute against the working directory first.
+#ifndef OXBASE_IO_OXFILETREEWALK_H
+#define OXBASE_IO_OXFILETREEWALK_H
+
+#include "oxbase/io/OxInodeTable.h"
+#include "oxbase/platform/OxPlatformFs.h"
+
+#include <cstddef>
+#include <cstdint>
+
+struct OxDirStream;
+
+/// What the callback is given.
+enum OxFileTreeWalkType {
+    OxFTWFile = 1,         ///< an object that is no directory
+    OxFTWDirectory = 2,    ///< a directory
+    OxFTWNoStat = 3,       ///< the start path, whose status was refused (errno 13)
+    OxFTWUnreadableDir = 4 ///< a directory whose listing was refused (errno 13)
+};
+
+/// The walk's callback. `path` is the walk's own buffer, valid during the
+/// call only; `status` is that path's status (without meaning for
+/// OxFTWNoStat). A non-zero result stops the walk and becomes run's result.
+typedef int (*OxFileTreeWalkCallback)(const char* path, const OxStat* status,
+                                      OxFileTreeWalkType type, void* userData);
+
+class OxFileTreeWalk {
+public:
+    /// One directory being read: its stream, or the names read ahead when the
+    /// stream was parked (each ended by a zero byte, the whole by one more).
+    struct FileTreeWalkDir {
+        OxDirStream* stream = nullptr;
+        char* content = nullptr; ///< owned
+    };
+
+    /// A walk with no depth limit. `path` is not copied: it must stay valid
+    /// until run returns. A `maxStreams` below 1 counts as 1.
+    OxFileTreeWalk(const char* path, OxFileTreeWalkCallback callback, int maxStreams,
+                   void* userData);
+    /// A walk that enters directories down to `maxDepth` levels below the
+    /// start (0: the start directory's entries are reported, its
+    /// subdirectories reported but not entered). Negative: no limit.
+    OxFileTreeWalk(const char* path, OxFileTreeWalkCallback callback, int maxStreams, int maxDepth,
+                   void* userData);
+    OxFileTreeWalk(const OxFileTreeWalk&) = delete;
+    OxFileTreeWalk& operator=(const OxFileTreeWalk&) = delete;
+    virtual ~OxFileTreeWalk();
+
+    /// Walks the tree: 0 when the walk ended normally, the callback's non-zero
+    /// result when it stopped the walk, -1 on failure. The working directory
+    /// is the same afterwards as before. An object serves one run: its inode
+    /// table is not cleared, so a second run finds its directories known.
+    int run();
+
+    int getMaxDepth() const { return maxDepth; }
+    std::size_t getMaxStreams() const { return maxStreams; }
+    const OxInodeTable& getInodeTable() const { return inodes; }
+
+private:
+    int walkDir(OxStat* status);
+    int process_entry(FileTreeWalkDir* dir, const char* name, std::size_t length);
+    int open_dir_stream(FileTreeWalkDir* dir);
+
+    /// Closes the stream of `dir` (errno unchanged) and steps the ring back.
+    void closeStream(FileTreeWalkDir* dir);
+    /// Makes `dirbuf` hold at least `needed` bytes by doubling.
+    bool growDirbuf(std::uint64_t needed);
+
+    int maxDepth = -1;
+    FileTreeWalkDir** dirStreams = nullptr;
+    std::size_t maxStreams = 1;
+    std::size_t activeSlot = 0;
+    char* dirbuf = nullptr;
+    std::uint32_t dirbufSize = 0;
+    std::int64_t base = 0;
+    int level = 0;
+    const char* startPath = nullptr;
+    OxFileTreeWalkCallback callback = nullptr;
+    void* userData = nullptr;
+    OxInodeTable inodes;
+};
+
+#endif

@@ -1,0 +1,40 @@
+// OxPlatformDir.h: reading directories, and the path facts a tree walk needs.
+//
+// A find handle lists the entries of one directory, "." and ".." included,
+// in the order the platform gives them. The pattern is the directory followed
+// by "*" (as the Windows find calls want it); on POSIX the "*" is dropped and
+// the directory is read with opendir/readdir.
+//
+//   const char * name = nullptr;
+//   OxPlatformFindHandle * handle = OxPlatformFindFirst("/data/*", &name);
+//   while (handle != nullptr && name != nullptr) { ...; if (OxPlatformFindNext(handle, &name) != 0)
+//   break; } OxPlatformFindClose(handle);
+#ifndef OXBASE_PLATFORM_OXPLATFORMDIR_H
+#define OXBASE_PLATFORM_OXPLATFORMDIR_H
+
+#include <cstddef>
+#include <string>
+
+/// An open directory listing; opaque.
+struct OxPlatformFindHandle;
+
+/// Opens a listing for `pattern` (a directory followed by "*"). On success the
+/// handle is returned and `*first` is the first entry's name, or null when the
+/// directory has no entry at all. On failure null with errno set (13 for a
+/// refused directory, 2 for a missing one). The name stays valid until the
+/// next call on the handle.
+OxPlatformFindHandle* OxPlatformFindFirst(const char* pattern, const char** first);
+/// The next entry's name in `*name`: 0, or -1 at the end of the listing (or
+/// with errno set on failure).
+int OxPlatformFindNext(OxPlatformFindHandle* handle, const char** name);
+/// Releases the listing: 0, or -1 with errno set. A null handle gives -1.
+int OxPlatformFindClose(OxPlatformFindHandle* handle);
+
+/// The length of the root of a path: 3 for "c:" on a platform with drives,
+/// else 1.
+std::size_t OxPlatformRootLength(const char* path);
+/// `path` made absolute against the working directory; an absolute path is
+/// copied as it is. False when the working directory cannot be read.
+bool OxPlatformMakeAbsolute(const char* path, std::string& out);
+
+#endif
