@@ -1,0 +1,187 @@
+#include "oxbase/doc/OxXmlAttribute.h"
+
+#include "oxbase/core/OxString.h"
+#include "oxbase/diag/OxPrt.h"
+
+#include <cmath>
+#include <iomanip>
+
+namespace {
+/// A trimmed copy of `text`: null for null or empty input.
+char* trimmedCopy(char const* text) {
+    return OxString::stripWhite(OxString::dup(text));
+}
+
+/// Puts `stream` into the fixed notation with nine digits behind the point.
+void setNineDigits(std::ostrstream* stream) {
+    stream->setf(std::ios::fixed, std::ios::floatfield);
+    stream->setf(std::ios::showpoint);
+    stream->precision(9);
+}
+
+/// Values per line of the list form.
+constexpr unsigned int kListLineValues = 11;
+} // namespace
+
+OxXmlAttribute::OxXmlAttribute(char const* name) : name(trimmedCopy(name)) {}
+
+OxXmlAttribute::OxXmlAttribute(char const* name, char const* value)
+    : name(trimmedCopy(name)), value(trimmedCopy(value)) {}
+
+OxXmlAttribute::OxXmlAttribute(char const* name, OxString const* value)
+    : name(trimmedCopy(name)), value(trimmedCopy(value != nullptr ? value->getString() : nullptr)) {
+}
+
+OxXmlAttribute::OxXmlAttribute(char const* name, char value) : name(trimmedCopy(name)) {
+    char text[2] = {value, '\0'};
+    this->value = trimmedCopy(text);
+}
+
+OxXmlAttribute::OxXmlAttribute(char const* name, unsigned char value)
+    : OxXmlAttribute(name, static_cast<char>(value)) {}
+
+OxXmlAttribute::OxXmlAttribute(char const* name, int value) : name(trimmedCopy(name)) {
+    std::ostrstream* stream = conversionPrt.getStr();
+    stream->unsetf(std::ios::basefield);
+    *stream << std::dec << value;
+    storeFormatted();
+}
+
+OxXmlAttribute::OxXmlAttribute(char const* name, unsigned int value) : name(trimmedCopy(name)) {
+    std::ostrstream* stream = conversionPrt.getStr();
+    *stream << std::dec << value;
+    storeFormatted();
+}
+
+OxXmlAttribute::OxXmlAttribute(char const* name, float value) : name(trimmedCopy(name)) {
+    std::ostrstream* stream = conversionPrt.getStr();
+    setNineDigits(stream);
+    *stream << value;
+    storeFormatted();
+}
+
+OxXmlAttribute::OxXmlAttribute(char const* name, double value) : name(trimmedCopy(name)) {
+    std::ostrstream* stream = conversionPrt.getStr();
+    setNineDigits(stream);
+    *stream << value;
+    storeFormatted();
+    OxString::stripTrailingZeros(this->value, '\0');
+}
+
+OxXmlAttribute::OxXmlAttribute(char const* name, OxGList<unsigned int> const& values)
+    : name(trimmedCopy(name)) {
+    storeList(values.getLength(), [&values](unsigned int i) {
+        // The decimal digits, in a new array like the texts of toString.
+        char digits[16];
+        std::ostrstream text(digits, sizeof digits);
+        text << std::dec << values[i] << std::ends;
+        return OxString::dup(digits);
+    });
+}
+
+OxXmlAttribute::OxXmlAttribute(char const* name, OxGList<double> const& values)
+    : name(trimmedCopy(name)) {
+    storeList(values.getLength(), [&values](unsigned int i) { return toString(values[i]); });
+}
+
+OxXmlAttribute::OxXmlAttribute(char const* name, unsigned int count, double* values)
+    : name(trimmedCopy(name)) {
+    if (values != nullptr) {
+        storeList(count, [values](unsigned int i) { return toString(values[i]); });
+    }
+}
+
+OxXmlAttribute::OxXmlAttribute(char const* name, unsigned int count, int* values)
+    : name(trimmedCopy(name)) {
+    if (values != nullptr) {
+        storeList(count,
+                  [values](unsigned int i) { return toString(static_cast<double>(values[i])); });
+    }
+}
+
+OxXmlAttribute::~OxXmlAttribute() {
+    delete[] name;
+    delete[] value;
+}
+
+void OxXmlAttribute::setValue(char const* text) {
+    delete[] value;
+    value = nullptr;
+    value = trimmedCopy(text);
+}
+
+void OxXmlAttribute::storeFormatted() {
+    delete[] value;
+    value = OxString::stripWhite(conversionPrt.flushToString());
+}
+
+template <class Text> void OxXmlAttribute::storeList(unsigned int count, Text text) {
+    std::ostrstream* stream = conversionPrt.getStr();
+    for (unsigned int i = 0; i < count; i++) {
+        char* number = text(i);
+        if (number == nullptr) {
+            // A half-formed list is not stored: empty the scratch stream.
+            delete[] conversionPrt.flushToString();
+            return;
+        }
+        *stream << " " << number;
+        delete[] number;
+        if ((i + 1) % kListLineValues == 0) {
+            *stream << "\n";
+        }
+    }
+    storeFormatted();
+}
+
+void OxXmlAttribute::storeJoined(unsigned int count, const double* numbers) {
+    std::ostrstream* stream = conversionPrt.getStr();
+    for (unsigned int i = 0; i < count; i++) {
+        char* number = toString(numbers[i]);
+        if (number == nullptr) {
+            delete[] conversionPrt.flushToString();
+            return;
+        }
+        if (i > 0) {
+            *stream << " ";
+        }
+        *stream << number;
+        delete[] number;
+    }
+    storeFormatted();
+}
+
+char* OxXmlAttribute::toString(double number) {
+    static OxPrt prt;
+    if (std::fabs(number) < 1e-9) {
+        number = 0.0;
+    }
+    std::ostrstream* stream = prt.getStr();
+    setNineDigits(stream);
+    *stream << number;
+    return OxString::stripTrailingZeros(prt.flushToString(), '\0');
+}
+
+OxBool OxXmlAttribute::write(std::ostrstream* stream) const {
+    if (name == nullptr) {
+        return OxFalse;
+    }
+    if (value == nullptr || stream == nullptr) {
+        return OxTrue;
+    }
+    *stream << " " << name << "="
+            << "\"" << value << "\"";
+    return OxTrue;
+}
+
+std::ostrstream* OxXmlAttribute::dump(std::ostrstream* stream) const {
+    if (stream == nullptr || name == nullptr) {
+        return stream;
+    }
+    oxIndent(*stream) << "XML Attribute: " << name;
+    if (value != nullptr) {
+        *stream << "=\"" << value << "\"\n";
+    } else {
+        *stream << OxString::str_unknown << "\n";
+    }
+    return stream;
+}

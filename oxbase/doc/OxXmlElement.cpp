@@ -1,0 +1,319 @@
+#include "oxbase/doc/OxXmlElement.h"
+
+#include "oxbase/core/OxString.h"
+#include "oxbase/core/OxSystem.h"
+#include "oxbase/diag/OxPrt.h"
+#include "oxbase/doc/OxXmlFile.h"
+
+#include <cstdlib>
+#include <cstring>
+#include <typeinfo>
+
+namespace {
+/// A trimmed copy of `text`: null for null or empty input.
+char* trimmedCopy(char const* text) {
+    return OxString::stripWhite(OxString::dup(text));
+}
+
+bool sameText(char const* a, char const* b) {
+    return a != nullptr && b != nullptr && std::strcmp(a, b) == 0;
+}
+
+/// The delimiters of the number lists: blank and tab, not the line end.
+char const* const kNumberDelimiters = " \t";
+
+} // namespace
+
+OxXmlElement::OxXmlElement(char const* elementName)
+    : type(XML_TYPE_ELEMENT), name(trimmedCopy(elementName)) {}
+
+OxXmlElement::OxXmlElement(XML_ELEMENT_TYPE elementType, char const* elementName)
+    : type(elementType), name(trimmedCopy(elementName)) {}
+
+OxXmlElement::~OxXmlElement() {
+    delete[] xsiType;
+    delete[] name;
+    delete[] value;
+    if (attributes != nullptr) {
+        for (unsigned int i = 0; i < attributes->length; i++) {
+            delete attributes->data[i];
+        }
+        delete attributes;
+    }
+    if (children == nullptr) {
+        return;
+    }
+    // The subtree goes without recursion: every element waiting for deletion
+    // is chained through its `parent` field, which nobody reads any more, and
+    // hands its own children to the chain before it is deleted childless.
+    OxXmlElement* pending = nullptr;
+    auto takeChildren = [&pending](OxGList<OxXmlElement*>*& list) {
+        for (unsigned int i = 0; i < list->length; i++) {
+            OxXmlElement* child = list->data[i];
+            if (child != nullptr) {
+                child->parent = pending;
+                pending = child;
+            }
+        }
+        delete list;
+        list = nullptr;
+    };
+    takeChildren(children);
+    while (pending != nullptr) {
+        OxXmlElement* element = pending;
+        pending = element->parent;
+        if (element->children != nullptr) {
+            takeChildren(element->children);
+        }
+        delete element;
+    }
+}
+
+void OxXmlElement::addAttribute(OxXmlAttribute* attribute) {
+    if (attributes == nullptr) {
+        attributes = new OxGList<OxXmlAttribute*>;
+    }
+    attributes->append(attribute);
+}
+
+void OxXmlElement::addChild(OxXmlElement* child) {
+    if (children == nullptr) {
+        children = new OxGList<OxXmlElement*>;
+    }
+    children->append(child);
+}
+
+OxBool OxXmlElement::deleteChild(unsigned int index) {
+    if (children == nullptr) {
+        return OxTrue;
+    }
+    if (index >= children->length) {
+        return OxFalse;
+    }
+    OxXmlElement* child = children->data[index];
+    if (child != nullptr) {
+        delete child;
+        children->data[index] = nullptr;
+    }
+    return OxTrue;
+}
+
+OxBool OxXmlElement::deleteChildren(char const* childName) {
+    if (childName == nullptr || children == nullptr) {
+        return OxTrue;
+    }
+    for (unsigned int i = 0; i < children->length; i++) {
+        OxXmlElement* child = children->data[i];
+        if (child != nullptr && sameText(child->name, childName)) {
+            delete child;
+            children->data[i] = nullptr;
+        }
+    }
+    children->removeNulls();
+    return OxTrue;
+}
+
+unsigned int OxXmlElement::getNbAttributes() const {
+    return attributes != nullptr ? attributes->length : 0;
+}
+
+unsigned int OxXmlElement::getNbChildElements() const {
+    return children != nullptr ? children->length : 0;
+}
+
+OxXmlAttribute* OxXmlElement::getAttribute(unsigned int index) const {
+    if (attributes == nullptr || index >= attributes->length) {
+        return nullptr;
+    }
+    return attributes->data[index];
+}
+
+OxXmlElement* OxXmlElement::getChild(unsigned int index) const {
+    if (children == nullptr || index >= children->length) {
+        return nullptr;
+    }
+    return children->data[index];
+}
+
+OxXmlAttribute* OxXmlElement::getAttributeByName(char const* attributeName) const {
+    if (attributeName == nullptr || attributes == nullptr) {
+        return nullptr;
+    }
+    for (unsigned int i = 0; i < attributes->length; i++) {
+        OxXmlAttribute* attribute = attributes->data[i];
+        if (attribute != nullptr && sameText(attribute->getName(), attributeName)) {
+            return attribute;
+        }
+    }
+    return nullptr;
+}
+
+char const* OxXmlElement::getAttributeValue(char const* attributeName) const {
+    OxXmlAttribute* attribute = getAttributeByName(attributeName);
+    return attribute != nullptr ? attribute->getValue() : nullptr;
+}
+
+OxXmlElement* OxXmlElement::getChildByName(char const* childName) const {
+    if (childName == nullptr || children == nullptr) {
+        return nullptr;
+    }
+    for (unsigned int i = 0; i < children->length; i++) {
+        OxXmlElement* child = children->data[i];
+        if (child != nullptr && sameText(child->name, childName)) {
+            return child;
+        }
+    }
+    return nullptr;
+}
+
+OxGList<OxXmlElement const*> OxXmlElement::getChildrenByName(char const* childName) const {
+    OxGList<OxXmlElement const*> found;
+    if (childName == nullptr || children == nullptr) {
+        return found;
+    }
+    for (unsigned int i = 0; i < children->length; i++) {
+        OxXmlElement* child = children->data[i];
+        if (child != nullptr && sameText(child->name, childName)) {
+            found.append(child);
+        }
+    }
+    return found;
+}
+
+OxBool OxXmlElement::isNamed(char const* otherName) const {
+    return OxToBool(sameText(name, otherName));
+}
+
+OxBool OxXmlElement::isYes(char const* attributeName) const {
+    return OxToBool(sameText(getAttributeValue(attributeName), OxXmlFile::OX_XML_LITERAL_YES));
+}
+
+void OxXmlElement::setName(char const* newName) {
+    delete[] name;
+    name = nullptr;
+    name = trimmedCopy(newName);
+}
+
+void OxXmlElement::setValue(char const* newValue) {
+    delete[] value;
+    value = nullptr;
+    value = trimmedCopy(newValue);
+}
+
+void OxXmlElement::setXsiType(char const* newType) {
+    delete[] xsiType;
+    xsiType = nullptr;
+    xsiType = trimmedCopy(newType);
+}
+
+int OxXmlElement::readNumbers(char const* attributeName, double* numbers,
+                              unsigned int count) const {
+    char const* text = getAttributeValue(attributeName);
+    if (text == nullptr) {
+        return 0;
+    }
+    char* copy = OxString::dup(text);
+    if (copy == nullptr) {
+        return -1;
+    }
+    unsigned int found = 0;
+    for (char* token = OxSystem::OxStrtok(copy, kNumberDelimiters);
+         token != nullptr && found < count;
+         token = OxSystem::OxStrtok(nullptr, kNumberDelimiters)) {
+        numbers[found++] = std::atof(OxString::stripWhite(token));
+    }
+    delete[] copy;
+    return found == count ? 1 : -1;
+}
+
+OxBool OxXmlElement::getIndices(OxGList<unsigned int>* indices) const {
+    if (indices == nullptr) {
+        return OxTrue;
+    }
+    char const* text = getAttributeValue(OxXmlFile::OX_XML_FIELD_INDICES);
+    if (text == nullptr) {
+        return OxTrue;
+    }
+    char* copy = OxString::stripWhite(OxString::dup(text));
+    if (copy == nullptr) {
+        return OxFalse;
+    }
+    unsigned int found = 0;
+    for (char* token = OxSystem::OxStrtok(copy, kNumberDelimiters); token != nullptr;
+         token = OxSystem::OxStrtok(nullptr, kNumberDelimiters)) {
+        indices->append(static_cast<unsigned int>(std::atol(OxString::stripWhite(token))));
+        found++;
+    }
+    delete[] copy;
+    return OxToBool(found > 0);
+}
+
+void OxXmlElement::dumpNode(std::ostrstream& stream) const {
+    if (name != nullptr) {
+        oxIndent(stream) << "XML Element: \"" << name << "\"";
+        if (value != nullptr) {
+            stream << "=\"" << value << "\"";
+        }
+        stream << "\n";
+    } else if (value != nullptr) {
+        stream << value << "\n";
+    }
+    if (xsiType != nullptr) {
+        oxIndent(stream) << "xsi:type : " << xsiType << "\n";
+    }
+    if (attributes != nullptr) {
+        OxPrt::adjustIndent(2);
+        for (unsigned int i = 0; i < attributes->length; i++) {
+            OxXmlAttribute* attribute = attributes->data[i];
+            if (attribute != nullptr) {
+                oxIndent(stream) << "attribute[" << i << "]:\n";
+                attribute->dump(&stream);
+            }
+        }
+        OxPrt::adjustIndent(-2);
+    }
+}
+
+std::ostrstream* OxXmlElement::dump(std::ostrstream* stream) const {
+    if (stream == nullptr) {
+        return stream;
+    }
+    // Depth-first with an explicit stack of (element, next child slot), in the
+    // order and with the indentation steps of the natural recursion: each
+    // element's children are listed between adjustIndent(2) and
+    // adjustIndent(-2). Elements of a derived class dump themselves.
+    struct Frame {
+        OxXmlElement const* element;
+        unsigned int next;
+    };
+    OxGList<Frame> stack;
+    auto enter = [&stack, stream](OxXmlElement const* element) {
+        element->dumpNode(*stream);
+        if (element->children != nullptr) {
+            OxPrt::adjustIndent(2);
+            stack.append(Frame{element, 0});
+        }
+    };
+    enter(this);
+    while (stack.length > 0) {
+        Frame& top = stack.data[stack.length - 1];
+        OxGList<OxXmlElement*>* list = top.element->children;
+        while (top.next < list->length && list->data[top.next] == nullptr) {
+            top.next++;
+        }
+        if (top.next >= list->length) {
+            OxPrt::adjustIndent(-2);
+            stack.length--;
+            continue;
+        }
+        unsigned int index = top.next++;
+        OxXmlElement const* child = list->data[index];
+        oxIndent(*stream) << "child[" << index << "]:\n";
+        if (typeid(*child) == typeid(OxXmlElement)) {
+            enter(child);
+        } else {
+            child->dump(stream);
+        }
+    }
+    return stream;
+}
