@@ -1,0 +1,473 @@
+// Tests of the file tree walk on real temporary trees, the directory-stream
+// layer and findFilesByExtension.
+#include "oxbase/io/OxFileTreeWalk.h"
+#include "oxbase/diag/OxPrt.h"
+#include "oxbase/io/OxDirStream.h"
+#include "oxbase/io/OxFile.h"
+#include "support/OxTestSupport.h"
+
+#include <algorithm>
+#include <cerrno>
+#include <cstring>
+#include <dirent.h>
+#include <filesystem>
+#include <functional>
+#include <gtest/gtest.h>
+#include <map>
+#include <string>
+#include <sys/stat.h>
+#include <unistd.h>
+#include <vector>
+
+namespace fs = std::filesystem;
+
+namespace {
+
+struct Visit {
+    std::string path;
+    OxFileTreeWalkType type;
+};
+
+struct Recorder {
+    std::vector<Visit> visits;
+    std::string stopAt; // a path ending that makes the callback return 7
+    std::function<void(const char*, OxFileTreeWalkType)> hook;
+};
+
+int record(const char* path, const OxStat*, OxFileTreeWalkType type, void* userData) {
+    Recorder* recorder = static_cast<Recorder*>(userData);
+    recorder->visits.push_back({path, type});
+    if (recorder->hook) {
+        recorder->hook(path, type);
+    }
+    std::string text = path;
+    if (!recorder->stopAt.empty() && text.size() >= recorder->stopAt.size() &&
+        text.compare(text.size() - recorder->stopAt.size(), std::string::npos, recorder->stopAt) ==
+            0) {
+        return 7;
+    }
+    return 0;
+}
+
+std::string cwd() {
+    char buffer[4096];
+    return getcwd(buffer, sizeof buffer) != nullptr ? buffer : "";
+}
+
+void makeFile(const std::string& path) {
+    oxtest::writeFile(path, "x");
+}
+
+/// root: a.txt .hidden b/ b/c.txt b/d/ b/d/e.txt f/
+void makeSmallTree(const std::string& root) {
+    makeFile(root + "/a.txt");
+    makeFile(root + "/.hidden");
+    fs::create_directories(root + "/b/d");
+    makeFile(root + "/b/c.txt");
+    makeFile(root + "/b/d/e.txt");
+    fs::create_directory(root + "/f");
+}
+
+/// Every object below `root` with its type, found by the standard library.
+std::map<std::string, OxFileTreeWalkType> expectedObjects(const std::string& root) {
+    std::map<std::string, OxFileTreeWalkType> objects;
+    objects[root] = OxFTWDirectory;
+    for (const auto& entry : fs::recursive_directory_iterator(root)) {
+        objects[entry.path().string()] = entry.is_directory() ? OxFTWDirectory : OxFTWFile;
+    }
+    return objects;
+}
+
+std::map<std::string, OxFileTreeWalkType> visitedOnce(const std::vector<Visit>& visits) {
+    std::map<std::string, OxFileTreeWalkType> objects;
+    for (const Visit& visit : visits) {
+        EXPECT_TRUE(objects.emplace(visit.path, visit.type).second) << "twice: " << visit.path;
+    }
+    return objects;
+}
+
+int indexOf(const std::vector<Visit>& visits, const std::string& path) {
+    for (size_t i = 0; i < visits.size(); i++) {
+        if (visits[i].path == path) {
+            return static_cast<int>(i);
+        }
+    }
+    return -1;
+}
+
+/// Open descriptors that name a directory below `root`.
+int openDirectoriesBelow(const std::string& root) {
+    int count = 0;
+    DIR* fds = opendir("/proc/self/fd");
+    if (fds == nullptr) {
+        return -1;
+    }
+    while (struct dirent* entry = readdir(fds)) {
+        char target[4096];
+        std::string link = std::string("/proc/self/fd/") + entry->d_name;
+        ssize_t length = readlink(link.c_str(), target, sizeof target - 1);
+        if (length > 0) {
+            target[length] = '\0';
+            if (std::string(target).rfind(root, 0) == 0) {
+                count++;
+            }
+        }
+    }
+    closedir(fds);
+    return count;
+}
+
+} // namespace
+
+TEST(OxFileTreeWalkTest, VisitsEveryObjectOnceWithOneOrTenSlots) {
+    oxtest::TempDir tmp;
+    std::string root = tmp.file("tree");
+    fs::create_directory(root);
+    makeSmallTree(root);
+    fs::create_directories(root + "/g/h/i/j");
+    makeFile(root + "/g/h/i/j/k.txt");
+    std::string before = cwd();
+
+    Recorder one;
+    Recorder ten;
+    OxFileTreeWalk walkOne(root.c_str(), record, 1, &one);
+    OxFileTreeWalk walkTen(root.c_str(), record, 10, &ten);
+    testing::internal::CaptureStderr();
+    EXPECT_EQ(walkOne.run(), 0);
+    EXPECT_EQ(walkTen.run(), 0);
+    EXPECT_EQ(testing::internal::GetCapturedStderr(), "");
+    EXPECT_EQ(cwd(), before);
+
+    EXPECT_EQ(visitedOnce(one.visits), expectedObjects(root));
+    EXPECT_EQ(visitedOnce(ten.visits), expectedObjects(root));
+    ASSERT_EQ(one.visits.size(), ten.visits.size());
+    for (size_t i = 0; i < one.visits.size(); i++) {
+        EXPECT_EQ(one.visits[i].path, ten.visits[i].path); // parking keeps the order
+    }
+    // A directory comes before its contents, and a subdirectory's contents
+    // before the next entry of its parent.
+    const std::vector<Visit>& v = ten.visits;
+    EXPECT_EQ(indexOf(v, root), 0);
+    EXPECT_LT(indexOf(v, root + "/b"), indexOf(v, root + "/b/c.txt"));
+    EXPECT_LT(indexOf(v, root + "/b/d"), indexOf(v, root + "/b/d/e.txt"));
+    int firstInB = indexOf(v, root + "/b");
+    int lastInB = std::max(indexOf(v, root + "/b/c.txt"), indexOf(v, root + "/b/d/e.txt"));
+    for (const char* outside : {"/a.txt", "/.hidden", "/f", "/g"}) {
+        int at = indexOf(v, root + outside);
+        EXPECT_TRUE(at < firstInB || at > lastInB) << outside;
+    }
+
+    // A second run of one object finds its start directory known.
+    Recorder again;
+    OxFileTreeWalk walkTwice(root.c_str(), record, 10, &again);
+    walkTwice.run();
+    size_t first = again.visits.size();
+    EXPECT_EQ(walkTwice.run(), 0);
+    EXPECT_EQ(again.visits.size(), first);
+}
+
+TEST(OxFileTreeWalkTest, DepthLimits) {
+    oxtest::TempDir tmp;
+    makeSmallTree(tmp.path());
+    const std::string& r = tmp.path();
+
+    Recorder zero;
+    OxFileTreeWalk walkZero(r.c_str(), record, 10, 0, &zero);
+    EXPECT_EQ(walkZero.getMaxDepth(), 0);
+    EXPECT_EQ(walkZero.run(), 0);
+    std::map<std::string, OxFileTreeWalkType> expected = {{r, OxFTWDirectory},
+                                                          {r + "/a.txt", OxFTWFile},
+                                                          {r + "/.hidden", OxFTWFile},
+                                                          {r + "/b", OxFTWDirectory},
+                                                          {r + "/f", OxFTWDirectory}};
+    EXPECT_EQ(visitedOnce(zero.visits), expected);
+
+    Recorder oneLevel;
+    OxFileTreeWalk walkOne(r.c_str(), record, 10, 1, &oneLevel);
+    EXPECT_EQ(walkOne.run(), 0);
+    expected[r + "/b/c.txt"] = OxFTWFile;
+    expected[r + "/b/d"] = OxFTWDirectory;
+    EXPECT_EQ(visitedOnce(oneLevel.visits), expected);
+
+    OxFileTreeWalk negative(r.c_str(), record, 0, -5, nullptr);
+    EXPECT_EQ(negative.getMaxDepth(), -1);
+    EXPECT_EQ(negative.getMaxStreams(), 1u);
+}
+
+TEST(OxFileTreeWalkTest, CallbackResultStopsTheWalk) {
+    oxtest::TempDir tmp;
+    makeSmallTree(tmp.path());
+    std::string before = cwd();
+    for (int streams : {1, 10}) {
+        Recorder recorder;
+        recorder.stopAt = "/b/c.txt";
+        OxFileTreeWalk walk(tmp.path().c_str(), record, streams, &recorder);
+        EXPECT_EQ(walk.run(), 7);
+        EXPECT_EQ(recorder.visits.back().path, tmp.path() + "/b/c.txt");
+        EXPECT_EQ(cwd(), before);
+    }
+}
+
+TEST(OxFileTreeWalkTest, LinksVanishingEntriesAndRelativeStart) {
+    oxtest::TempDir tmp;
+    std::string root = tmp.file("tree");
+    fs::create_directory(root);
+    makeSmallTree(root);
+    fs::create_directory_symlink("..", root + "/b/up");         // to an ancestor
+    fs::create_directory_symlink(root + "/b", root + "/alias"); // a second way in
+
+    Recorder linked;
+    OxFileTreeWalk walk(root.c_str(), record, 10, &linked);
+    EXPECT_EQ(walk.run(), 0);
+    std::map<std::string, OxFileTreeWalkType> seen = visitedOnce(linked.visits);
+    EXPECT_EQ(seen.count(root + "/b/up"), 0u);
+    // b is met twice (as b and as alias); whichever comes second is skipped.
+    EXPECT_EQ(seen.count(root + "/b") + seen.count(root + "/alias"), 1u);
+    for (const Visit& visit : linked.visits) {
+        EXPECT_EQ(visit.path.find("/up/"), std::string::npos) << visit.path;
+    }
+
+    // Files removed after the listing was read are passed over in silence.
+    oxtest::TempDir flat;
+    for (int i = 0; i < 20; i++) {
+        makeFile(flat.file("file" + std::to_string(i)));
+    }
+    for (int streams : {1, 10}) {
+        Recorder vanish;
+        vanish.hook = [&](const char* path, OxFileTreeWalkType type) {
+            if (type != OxFTWFile || vanish.visits.size() != 2) {
+                return;
+            }
+            for (const auto& entry : fs::directory_iterator(flat.path())) {
+                if (entry.path().string() != path) {
+                    fs::remove(entry.path());
+                }
+            }
+        };
+        testing::internal::CaptureStderr();
+        OxFileTreeWalk walkFlat(flat.path().c_str(), record, streams, &vanish);
+        EXPECT_EQ(walkFlat.run(), 0);
+        EXPECT_EQ(testing::internal::GetCapturedStderr(), "");
+        EXPECT_EQ(vanish.visits.size(), 2u); // the directory and the first file
+        if (streams == 1) {
+            for (int i = 0; i < 20; i++) {
+                makeFile(flat.file("file" + std::to_string(i)));
+            }
+        }
+    }
+
+    // A relative start path walks like its absolute form.
+    std::string before = cwd();
+    ASSERT_EQ(chdir(tmp.path().c_str()), 0);
+    Recorder relative;
+    OxFileTreeWalk walkRelative("tree/", record, 1, &relative);
+    EXPECT_EQ(walkRelative.run(), 0);
+    EXPECT_EQ(cwd(), tmp.path());
+    EXPECT_EQ(visitedOnce(relative.visits), seen);
+    Recorder dotted;
+    OxFileTreeWalk walkDotted("./tree/b", record, 1, &dotted);
+    EXPECT_EQ(walkDotted.run(), 0);
+    // b, c.txt, d, d/e.txt, then up (the tree, new to this walk) with a.txt,
+    // .hidden and f; alias and b below it lead to b, which is known.
+    EXPECT_EQ(dotted.visits.size(), 8u);
+    ASSERT_EQ(chdir(before.c_str()), 0);
+}
+
+TEST(OxFileTreeWalkTest, OpenStreamsNeverExceedTheSlots) {
+    oxtest::TempDir tmp;
+    std::string dir = tmp.file("deep");
+    for (int level = 0; level < 12; level++) {
+        fs::create_directories(dir);
+        makeFile(dir + "/f1");
+        makeFile(dir + "/f2");
+        fs::create_directory(dir + "/empty");
+        dir += "/d" + std::to_string(level);
+    }
+    std::string root = tmp.file("deep");
+    for (int streams : {1, 3, 10}) {
+        int most = 0;
+        int visits = 0;
+        Recorder recorder;
+        recorder.hook = [&](const char*, OxFileTreeWalkType) {
+            visits++;
+            most = std::max(most, openDirectoriesBelow(root));
+        };
+        OxFileTreeWalk walk(root.c_str(), record, streams, &recorder);
+        EXPECT_EQ(walk.run(), 0);
+        EXPECT_EQ(visits, 1 + 12 * 3 + 11);
+        // On a tree 12 levels deep the ring is full at the bottom.
+        EXPECT_EQ(most, streams) << streams;
+        EXPECT_EQ(openDirectoriesBelow(root), 0);
+    }
+}
+
+TEST(OxFileTreeWalkTest, StartPaths) {
+    oxtest::TempDir tmp;
+    makeSmallTree(tmp.path());
+    std::string before = cwd();
+
+    testing::internal::CaptureStderr();
+    OxFileTreeWalk none(nullptr, record, 10, nullptr);
+    EXPECT_EQ(none.run(), -1);
+    OxFileTreeWalk empty("", record, 10, nullptr);
+    EXPECT_EQ(empty.run(), -1);
+    EXPECT_EQ(testing::internal::GetCapturedStderr(),
+              "OxFileTreeWalk::run: returning -1 at line 224\n"
+              "OxFileTreeWalk::run: returning -1 at line 229\n");
+
+    Recorder file;
+    // The walk keeps the caller's pointer: the texts must outlive run.
+    std::string fileName = tmp.file("a.txt");
+    std::string missingName = tmp.file("nothing");
+    std::string orphanName = tmp.file("no/such");
+    OxFileTreeWalk walkFile(fileName.c_str(), record, 10, &file);
+    EXPECT_EQ(walkFile.run(), 0);
+    ASSERT_EQ(file.visits.size(), 1u);
+    EXPECT_EQ(file.visits[0].type, OxFTWFile);
+
+    Recorder missing;
+    missing.stopAt = "nothing";
+    OxFileTreeWalk walkMissing(missingName.c_str(), record, 10, &missing);
+    EXPECT_EQ(walkMissing.run(), 7);
+    ASSERT_EQ(missing.visits.size(), 1u);
+    EXPECT_EQ(missing.visits[0].type, OxFTWFile);
+
+    Recorder orphan;
+    OxFileTreeWalk walkOrphan(orphanName.c_str(), record, 10, &orphan);
+    EXPECT_EQ(walkOrphan.run(), -1);
+    EXPECT_TRUE(orphan.visits.empty());
+
+    // Trailing separators of either kind are dropped; paths get one '/'.
+    Recorder trailing;
+    std::string withSeparators = tmp.path() + "/b//\\";
+    OxFileTreeWalk walkTrailing(withSeparators.c_str(), record, 10, &trailing);
+    EXPECT_EQ(walkTrailing.run(), 0);
+    EXPECT_EQ(trailing.visits[0].path, tmp.path() + "/b");
+    EXPECT_GE(indexOf(trailing.visits, tmp.path() + "/b/c.txt"), 0);
+    EXPECT_EQ(cwd(), before);
+}
+
+TEST(OxFileTreeWalkTest, BadInputNeverCrashes) {
+    oxtest::TempDir tmp;
+    const std::string& r = tmp.path();
+    // Names with blanks and bytes beyond ASCII.
+    fs::create_directory(r + "/dir with blank");
+    makeFile(r + "/dir with blank/a b.txt");
+    makeFile(r + "/\xe9t\xe9\xff.xml");
+    // Paths far beyond 260 characters.
+    std::string deep = r;
+    for (int i = 0; i < 8; i++) {
+        deep += "/" + std::string(60, static_cast<char>('a' + i));
+    }
+    fs::create_directories(deep);
+    makeFile(deep + "/leaf.txt");
+    ASSERT_GT(deep.size(), 400u);
+
+    Recorder all;
+    OxFileTreeWalk walk(r.c_str(), record, 2, &all);
+    EXPECT_EQ(walk.run(), 0);
+    EXPECT_EQ(visitedOnce(all.visits), expectedObjects(r));
+
+    // A start path longer than 260 characters is walked whole.
+    Recorder fromDeep;
+    OxFileTreeWalk walkDeep(deep.c_str(), record, 2, &fromDeep);
+    EXPECT_EQ(walkDeep.run(), 0);
+    ASSERT_EQ(fromDeep.visits.size(), 2u);
+    EXPECT_EQ(fromDeep.visits[1].path, deep + "/leaf.txt");
+
+    // An unreadable directory: reported once, the walk goes on. Root reads
+    // every directory, so the case only holds for other users.
+    std::string locked = r + "/locked";
+    fs::create_directory(locked);
+    makeFile(locked + "/inside");
+    chmod(locked.c_str(), 0);
+    DIR* probe = opendir(locked.c_str());
+    if (probe != nullptr) {
+        closedir(probe);
+    } else {
+        Recorder refused;
+        testing::internal::CaptureStderr();
+        OxFileTreeWalk walkLocked(r.c_str(), record, 10, &refused);
+        EXPECT_EQ(walkLocked.run(), 0);
+        EXPECT_EQ(testing::internal::GetCapturedStderr(),
+                  "OxFileTreeWalk::open_dir_stream: returning -1 at line 736\ndirbuf: \"" + locked +
+                      "\"\n");
+        std::map<std::string, OxFileTreeWalkType> seen = visitedOnce(refused.visits);
+        EXPECT_EQ(seen[locked], OxFTWUnreadableDir);
+        EXPECT_EQ(seen.count(locked + "/inside"), 0u);
+    }
+    chmod(locked.c_str(), 0700);
+}
+
+TEST(OxFileTreeWalkTest, DirectoryStreams) {
+    oxtest::TempDir tmp;
+    makeFile(tmp.file("only"));
+    std::string withSlash = tmp.path() + "/";
+    OxDirStream* stream = OxDirStream::opendir(withSlash.c_str());
+    ASSERT_NE(stream, nullptr);
+    EXPECT_STREQ(stream->pattern, (tmp.path() + "/*").c_str());
+    EXPECT_EQ(stream->d_name, nullptr);
+    std::vector<std::string> names;
+    while (OxDirStream* entry = OxDirStream::readdir(stream)) {
+        EXPECT_EQ(static_cast<size_t>(entry->d_namlen), std::strlen(entry->d_name));
+        names.push_back(entry->d_name);
+    }
+    std::sort(names.begin(), names.end());
+    EXPECT_EQ(names, (std::vector<std::string>{".", "..", "only"}));
+    EXPECT_EQ(OxDirStream::closedir(stream), 0);
+
+    stream = OxDirStream::opendir(tmp.path().c_str());
+    ASSERT_NE(stream, nullptr);
+    EXPECT_STREQ(stream->pattern, (tmp.path() + "/*").c_str());
+    OxDirStream::closedir(stream);
+
+    errno = 0;
+    EXPECT_EQ(OxDirStream::opendir(""), nullptr);
+    EXPECT_EQ(errno, 22);
+    EXPECT_EQ(OxDirStream::readdir(nullptr), nullptr);
+    errno = 0;
+    EXPECT_EQ(OxDirStream::closedir(nullptr), -1);
+    EXPECT_EQ(errno, 9);
+
+    unsigned int saved = OxPrt::getTraceThreshold();
+    std::string missing = tmp.file("missing");
+    testing::internal::CaptureStderr();
+    EXPECT_EQ(OxDirStream::opendir(missing.c_str()), nullptr);
+    EXPECT_EQ(errno, ENOENT);
+    OxPrt::setTraceThreshold(99);
+    EXPECT_EQ(OxDirStream::opendir(missing.c_str()), nullptr);
+    OxPrt::setTraceThreshold(saved);
+    EXPECT_EQ(testing::internal::GetCapturedStderr(),
+              "opendir: _findfirst failed to locate \"" + missing + "/*\"\n");
+}
+
+TEST(OxFileTreeWalkTest, FindFilesByExtension) {
+    oxtest::TempDir tmp;
+    makeSmallTree(tmp.path());
+    fs::create_directory(tmp.file("x.txt")); // a directory with the ending
+    makeFile(tmp.file("plain.txtx"));
+
+    OxGList<char*> files;
+    EXPECT_EQ(OxFile::findFilesByExtension(tmp.path().c_str(), files, ".txt", OxFalse), OxTrue);
+    std::vector<std::string> flat;
+    for (unsigned int i = 0; i < files.getLength(); i++) {
+        flat.push_back(files[i]);
+        delete[] files[i];
+    }
+    files.makeEmpty();
+    std::sort(flat.begin(), flat.end());
+    EXPECT_EQ(flat, (std::vector<std::string>{tmp.file("a.txt"), tmp.file("x.txt")}));
+
+    EXPECT_EQ(OxFile::findFilesByExtension(tmp.path().c_str(), files, ".txt", OxTrue), OxTrue);
+    EXPECT_EQ(files.getLength(), 4u); // a.txt, x.txt, b/c.txt, b/d/e.txt
+    for (unsigned int i = 0; i < files.getLength(); i++) {
+        delete[] files[i];
+    }
+    OxGList<char*> none;
+    EXPECT_EQ(OxFile::findFilesByExtension(nullptr, none, ".txt", OxTrue), OxFalse);
+    EXPECT_EQ(OxFile::findFilesByExtension(tmp.path().c_str(), none, nullptr, OxTrue), OxFalse);
+    EXPECT_EQ(OxFile::findFilesByExtension(tmp.file("none").c_str(), none, ".txt", OxTrue), OxTrue);
+    EXPECT_EQ(OxFile::findFilesByExtension(tmp.file("a.txt").c_str(), none, ".txt", OxTrue),
+              OxTrue);
+    EXPECT_EQ(none.getLength(), 0u);
+}
