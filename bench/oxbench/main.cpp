@@ -26,6 +26,7 @@
 #include <string>
 #include <vector>
 
+#include <malloc.h>
 #include <poll.h>
 #include <sys/resource.h>
 #include <sys/wait.h>
@@ -102,6 +103,7 @@ const RowSpec kRows[] = {
 struct Options {
     bool quick = false;
     bool keep = false;
+    bool coldHeap = false;
     int runs = 5;
     int timeoutSeconds = 180;
     std::vector<std::string> cases;
@@ -152,7 +154,8 @@ void copyNote(ChildReport& report, const std::string& note) {
 
 // Runs in the child: prepare, then either one measured run for the peak
 // memory, or a warm-up and `runs` timed runs.
-ChildReport childWork(const Entry& entry, const Corpus& corpus, int runs, bool memory) {
+ChildReport childWork(const Entry& entry, const Corpus& corpus, int runs, bool memory,
+                      bool coldHeap) {
     ChildReport report;
     std::unique_ptr<Runner> runner = entry.factory();
     std::string note;
@@ -180,6 +183,17 @@ ChildReport childWork(const Entry& entry, const Corpus& corpus, int runs, bool m
         Outcome outcome = runner->run();
         auto stop = std::chrono::steady_clock::now();
         runner->afterRun(outcome);
+        // What afterRun freed is consolidated now, untimed, and not by the
+        // first large allocation of the next run (a large request makes the
+        // allocator merge its freed small chunks first). With --cold-heap the
+        // freed memory goes back to the system instead, so that each run
+        // touches fresh pages as a new process would.
+        if (coldHeap) {
+            malloc_trim(0);
+        } else {
+            void* large = std::malloc(std::size_t(1) << 20);
+            std::free(large);
+        }
         if (!outcome.ok) {
             report.state = 2;
             copyNote(report, outcome.note);
@@ -224,7 +238,7 @@ RowResult runRow(const RowSpec& spec, const Corpus& corpus, const Options& optio
     }
     if (pid == 0) {
         close(fds[0]);
-        ChildReport report = childWork(*entry, corpus, options.runs, memory);
+        ChildReport report = childWork(*entry, corpus, options.runs, memory, options.coldHeap);
         const char* data = reinterpret_cast<const char*>(&report);
         std::size_t left = sizeof(report);
         while (left > 0) {
@@ -344,7 +358,7 @@ std::string cpuModel() {
 
 void usage() {
     std::cerr << "usage: oxbench [--quick] [--case NAME]... [--runs N] [--timeout SECONDS] "
-                 "[--keep] [--list]\n";
+                 "[--keep] [--cold-heap] [--list]\n";
 }
 
 bool wanted(const Options& options, const std::string& caseName) {
@@ -431,6 +445,8 @@ int main(int argc, char** argv) {
         std::string arg = argv[i];
         if (arg == "--quick") {
             options.quick = true;
+        } else if (arg == "--cold-heap") {
+            options.coldHeap = true;
         } else if (arg == "--keep") {
             options.keep = true;
         } else if (arg == "--case" && i + 1 < argc) {
@@ -492,7 +508,9 @@ int main(int argc, char** argv) {
     std::strftime(date, sizeof(date), "%Y-%m-%d %H:%M UTC", std::gmtime(&now));
     std::cout << "oxbench " << (options.quick ? "--quick " : "") << "on " << cpuModel() << ", "
               << sysconf(_SC_NPROCESSORS_ONLN) << " CPUs, " << date << "; median of "
-              << options.runs << " runs after one warm-up.\n\n";
+              << options.runs << " runs after one warm-up"
+              << (options.coldHeap ? ", heap returned to the system before each run" : "")
+              << ".\n\n";
     std::cout << "Corpora: XML model " << fmt("%.1f", fileSize(corpus.xmlModel) / 1e6)
               << " MB, comment document " << fmt("%.1f", fileSize(corpus.xmlComment) / 1e6)
               << " MB, CSV " << fmt("%.1f", fileSize(corpus.csvTable) / 1e6) << " MB, "
