@@ -165,6 +165,15 @@ bool OxPlatformMakeAbsolute(const char* path, std::string& out) {
         out.clear();
         return false;
     }
-    out = OxPlatformJoinPath(cwd, path);
+    // Leading "." components name the working directory itself: "." gives
+    // the working directory, "./a" gives "<cwd>/a".
+    const char* rest = path;
+    while (rest[0] == '.' && (rest[1] == '\0' || OxPlatformIsSeparator(rest[1]))) {
+        rest += rest[1] == '\0' ? 1 : 2;
+        while (OxPlatformIsSeparator(rest[0])) {
+            rest++;
+        }
+    }
+    out = rest[0] != '\0' ? OxPlatformJoinPath(cwd, rest) : cwd;
     return true;
 }
