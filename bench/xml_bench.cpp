@@ -66,8 +66,11 @@ private:
                     }
                     text += "\"/>\n    <points>\n";
                     for (unsigned int i = 0; i < 12; i++) {
-                        text += "     <point vec3d=\"" + number(seed += 104729) + " " +
-                                number(seed += 7) + " " + number(seed += 13) + "\"/>\n";
+                        unsigned int x = seed += 104729;
+                        unsigned int y = seed += 7;
+                        unsigned int z = seed += 13;
+                        text += "     <point vec3d=\"" + number(x) + " " + number(y) + " " +
+                                number(z) + "\"/>\n";
                     }
                     text += "    </points>\n   </part>\n";
                 }
