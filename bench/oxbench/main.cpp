@@ -148,8 +148,26 @@ long long currentRssBytes() {
     return resident * sysconf(_SC_PAGESIZE);
 }
 
+void copyText(char* target, std::size_t size, const std::string& text) {
+    std::snprintf(target, size, "%s", text.c_str());
+}
+
 void copyNote(ChildReport& report, const std::string& note) {
-    std::snprintf(report.note, sizeof(report.note), "%s", note.c_str());
+    copyText(report.note, sizeof(report.note), note);
+}
+
+// What afterRun freed is consolidated now, untimed, and not by the first
+// large allocation of the next run (a large request makes the allocator merge
+// its freed small chunks first). With --cold-heap the freed memory goes back
+// to the system instead, so that each run touches fresh pages as a new
+// process would.
+void releaseHeap(bool coldHeap) {
+    if (coldHeap) {
+        malloc_trim(0);
+    } else {
+        void* large = std::malloc(std::size_t(1) << 20);
+        std::free(large);
+    }
 }
 
 // Runs in the child: prepare, then either one measured run for the peak
@@ -183,17 +201,7 @@ ChildReport childWork(const Entry& entry, const Corpus& corpus, int runs, bool m
         Outcome outcome = runner->run();
         auto stop = std::chrono::steady_clock::now();
         runner->afterRun(outcome);
-        // What afterRun freed is consolidated now, untimed, and not by the
-        // first large allocation of the next run (a large request makes the
-        // allocator merge its freed small chunks first). With --cold-heap the
-        // freed memory goes back to the system instead, so that each run
-        // touches fresh pages as a new process would.
-        if (coldHeap) {
-            malloc_trim(0);
-        } else {
-            void* large = std::malloc(std::size_t(1) << 20);
-            std::free(large);
-        }
+        releaseHeap(coldHeap);
         if (!outcome.ok) {
             report.state = 2;
             copyNote(report, outcome.note);
@@ -318,6 +326,248 @@ RowResult runRow(const RowSpec& spec, const Corpus& corpus, const Options& optio
         result.median = n % 2 == 1 ? times[n / 2] : (times[n / 2 - 1] + times[n / 2]) / 2.0;
     }
     return result;
+}
+
+// ---- Interleaved timing -------------------------------------------------
+//
+// The implementations of one case are timed in turns: each lives in its own
+// child process (prepared once), and the parent asks them for one run after
+// the other, round by round, the first of a round rotating. On a shared,
+// noisy machine every implementation of a case then sees the same load, and
+// the ratios stay meaningful.
+
+struct RunReport {
+    int state = 0; // 0 ok, 1 prepare failed, 2 the run failed
+    double seconds = 0.0;
+    double amount = 0.0;
+    double check = 0.0;
+    int countsItems = 0;
+    char note[512] = {};
+};
+
+bool writeAll(int fd, const void* data, std::size_t size) {
+    const char* p = static_cast<const char*>(data);
+    while (size > 0) {
+        ssize_t n = write(fd, p, size);
+        if (n <= 0) {
+            return false;
+        }
+        p += n;
+        size -= static_cast<std::size_t>(n);
+    }
+    return true;
+}
+
+// Reads one report; false on end of file, error or when the deadline passes.
+bool readReport(int fd, RunReport& report, int timeoutSeconds, bool& timedOut) {
+    timedOut = false;
+    char* data = reinterpret_cast<char*>(&report);
+    std::size_t got = 0;
+    auto deadline = std::chrono::steady_clock::now() + std::chrono::seconds(timeoutSeconds);
+    while (got < sizeof(report)) {
+        auto left = std::chrono::duration_cast<std::chrono::milliseconds>(
+                        deadline - std::chrono::steady_clock::now())
+                        .count();
+        if (left <= 0) {
+            timedOut = true;
+            return false;
+        }
+        struct pollfd p {
+            fd, POLLIN, 0
+        };
+        int ready = poll(&p, 1, static_cast<int>(std::min<long long>(left, 1000)));
+        if (ready < 0 && errno != EINTR) {
+            return false;
+        }
+        if (ready <= 0) {
+            continue;
+        }
+        ssize_t n = read(fd, data + got, sizeof(report) - got);
+        if (n <= 0) {
+            return false;
+        }
+        got += static_cast<std::size_t>(n);
+    }
+    return true;
+}
+
+// The child's side: prepare, report, then one run per 'r' until 'q'.
+[[noreturn]] void serveRuns(const Entry& entry, const Corpus& corpus, bool coldHeap, int cmdFd,
+                            int reportFd) {
+    std::unique_ptr<Runner> runner = entry.factory();
+    RunReport ready;
+    std::string note;
+    ready.state = runner->prepare(corpus, note) ? 0 : 1;
+    ready.countsItems = runner->countsItems() ? 1 : 0;
+    copyText(ready.note, sizeof(ready.note), note);
+    writeAll(reportFd, &ready, sizeof(ready));
+    char command = 0;
+    while (ready.state == 0 && read(cmdFd, &command, 1) == 1 && command == 'r') {
+        RunReport report;
+        auto start = std::chrono::steady_clock::now();
+        Outcome outcome = runner->run();
+        auto stop = std::chrono::steady_clock::now();
+        runner->afterRun(outcome);
+        releaseHeap(coldHeap);
+        report.state = outcome.ok ? 0 : 2;
+        report.seconds = std::chrono::duration<double>(stop - start).count();
+        report.amount = outcome.amount;
+        report.check = outcome.check;
+        report.countsItems = ready.countsItems;
+        copyText(report.note, sizeof(report.note), outcome.note);
+        if (!writeAll(reportFd, &report, sizeof(report))) {
+            break;
+        }
+    }
+    _exit(0);
+}
+
+struct Worker {
+    RowResult* result = nullptr;
+    pid_t pid = -1;
+    int cmdFd = -1;
+    int reportFd = -1;
+    std::vector<double> times;
+    bool alive = false;
+};
+
+void stopWorker(Worker& w, const std::string& status, bool timedOut) {
+    if (w.pid > 0) {
+        if (timedOut) {
+            kill(w.pid, SIGKILL);
+        }
+        if (w.cmdFd >= 0) {
+            writeAll(w.cmdFd, "q", 1);
+            close(w.cmdFd);
+        }
+        if (w.reportFd >= 0) {
+            close(w.reportFd);
+        }
+        int wstatus = 0;
+        waitpid(w.pid, &wstatus, 0);
+        if (status == "no report" && WIFSIGNALED(wstatus)) {
+            w.result->status = "crashed (signal " + std::to_string(WTERMSIG(wstatus)) + ")";
+        } else if (!status.empty() && w.result->status.empty()) {
+            w.result->status = status;
+        }
+    }
+    w.pid = -1;
+    w.cmdFd = w.reportFd = -1;
+    w.alive = false;
+}
+
+std::string failureStatus(bool timedOut, int timeoutSeconds) {
+    return timedOut ? "timeout (> " + std::to_string(timeoutSeconds) + " s)" : "no report";
+}
+
+// Times every implementation of one case in turns; fills `results`, which
+// holds one entry per row of the case, with `spec` set.
+void runCaseInterleaved(std::vector<RowResult*>& results, const Corpus& corpus,
+                        const Options& options) {
+    std::vector<Worker> workers;
+    for (RowResult* r : results) {
+        Worker w;
+        w.result = r;
+        const Entry* entry = findEntry(r->spec->caseName, r->spec->impl);
+        if (entry == nullptr) {
+            r->status = "not built";
+            workers.push_back(w);
+            continue;
+        }
+        std::fflush(stdout);
+        std::fflush(stderr);
+        std::cout.flush();
+        std::cerr.flush();
+        int cmd[2], rep[2];
+        if (pipe(cmd) != 0) {
+            r->status = "pipe failed";
+            workers.push_back(w);
+            continue;
+        }
+        if (pipe(rep) != 0) {
+            close(cmd[0]);
+            close(cmd[1]);
+            r->status = "pipe failed";
+            workers.push_back(w);
+            continue;
+        }
+        pid_t pid = fork();
+        if (pid == 0) {
+            close(cmd[1]);
+            close(rep[0]);
+            for (const Worker& other : workers) {
+                if (other.cmdFd >= 0) {
+                    close(other.cmdFd);
+                    close(other.reportFd);
+                }
+            }
+            serveRuns(*entry, corpus, options.coldHeap, cmd[0], rep[1]);
+        }
+        close(cmd[0]);
+        close(rep[1]);
+        if (pid < 0) {
+            close(cmd[1]);
+            close(rep[0]);
+            r->status = "fork failed";
+            workers.push_back(w);
+            continue;
+        }
+        w.pid = pid;
+        w.cmdFd = cmd[1];
+        w.reportFd = rep[0];
+        RunReport ready;
+        bool timedOut = false;
+        if (!readReport(w.reportFd, ready, options.timeoutSeconds, timedOut)) {
+            stopWorker(w, failureStatus(timedOut, options.timeoutSeconds), timedOut);
+        } else if (ready.state != 0) {
+            r->note = ready.note;
+            stopWorker(w, "skipped", false);
+        } else {
+            w.alive = true;
+        }
+        workers.push_back(w);
+    }
+    for (int round = -1; round < options.runs; round++) {
+        std::size_t n = workers.size();
+        for (std::size_t k = 0; k < n; k++) {
+            Worker& w = workers[(k + static_cast<std::size_t>(round + 1)) % n];
+            if (!w.alive) {
+                continue;
+            }
+            RunReport report;
+            bool timedOut = false;
+            if (!writeAll(w.cmdFd, "r", 1) ||
+                !readReport(w.reportFd, report, options.timeoutSeconds, timedOut)) {
+                stopWorker(w, failureStatus(timedOut, options.timeoutSeconds), timedOut);
+                continue;
+            }
+            if (report.state != 0) {
+                w.result->note = report.note;
+                stopWorker(w, "failed", false);
+                continue;
+            }
+            if (report.note[0] != '\0') {
+                w.result->note = report.note;
+            }
+            w.result->amount = report.amount;
+            w.result->check = report.check;
+            w.result->countsItems = report.countsItems != 0;
+            if (round >= 0) {
+                w.times.push_back(report.seconds);
+            }
+        }
+    }
+    for (Worker& w : workers) {
+        if (w.alive) {
+            std::vector<double> times = w.times;
+            std::sort(times.begin(), times.end());
+            std::size_t n = times.size();
+            w.result->median =
+                n == 0 ? 0.0
+                       : (n % 2 == 1 ? times[n / 2] : (times[n / 2 - 1] + times[n / 2]) / 2.0);
+            stopWorker(w, "", false);
+        }
+    }
 }
 
 std::string fmt(const char* format, double value) {
@@ -488,19 +738,42 @@ int main(int argc, char** argv) {
     // the bench message, logged to a file below the corpus directory.
     OxMsg messages(corpus.messageFile.c_str(), nullptr, "oxbench.log", corpus.logDir.c_str());
 
+    // Rows of one case stand together in kRows. The memory rows run one by
+    // one (one read in a fresh child each); the others are timed in turns.
     std::vector<RowResult> results;
-    for (const RowSpec& row : kRows) {
-        if (!wanted(options, row.caseName)) {
-            continue;
+    results.reserve(sizeof(kRows) / sizeof(kRows[0]));
+    std::size_t count = sizeof(kRows) / sizeof(kRows[0]);
+    for (std::size_t i = 0; i < count;) {
+        std::size_t j = i;
+        while (j < count && std::strcmp(kRows[j].caseName, kRows[i].caseName) == 0) {
+            j++;
         }
-        std::cerr << "oxbench: " << row.caseName << " / " << row.impl << "..." << std::flush;
-        RowResult r = runRow(row, corpus, options);
-        std::cerr << " "
-                  << (!r.status.empty()  ? r.status
-                      : r.peakBytes >= 0 ? fmt("peak %.1f MB", r.peakBytes / 1e6)
-                                         : timeText(r.median))
-                  << "\n";
-        results.push_back(r);
+        if (wanted(options, kRows[i].caseName)) {
+            std::cerr << "oxbench: " << kRows[i].caseName << "..." << std::flush;
+            std::vector<RowResult*> group;
+            for (std::size_t k = i; k < j; k++) {
+                if (std::strcmp(kRows[k].caseName, "xml-read-memory") == 0) {
+                    results.push_back(runRow(kRows[k], corpus, options));
+                } else {
+                    RowResult r;
+                    r.spec = &kRows[k];
+                    results.push_back(r);
+                    group.push_back(&results.back());
+                }
+            }
+            if (!group.empty()) {
+                runCaseInterleaved(group, corpus, options);
+            }
+            for (std::size_t k = results.size() - (j - i); k < results.size(); k++) {
+                const RowResult& r = results[k];
+                std::cerr << " "
+                          << (!r.status.empty()  ? r.status
+                              : r.peakBytes >= 0 ? fmt("peak %.1f MB", r.peakBytes / 1e6)
+                                                 : timeText(r.median));
+            }
+            std::cerr << "\n";
+        }
+        i = j;
     }
 
     char date[64];
