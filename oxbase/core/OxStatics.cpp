@@ -14,10 +14,11 @@
 #include "oxbase/diag/OxPrt.h"
 #include "oxbase/doc/OxXmlAttribute.h"
 #include "oxbase/core/OxName.h"
+#include "oxbase/geom/OxRot.h"
 // @@STATICS-INCLUDES@@
 
 // 1. The identity matrix.
-// @@STATIC-1-IDENTITY@@
+const OxRot OX_IDENTITY_3X3_MATRIX = OxRot::identity();
 
 // 2. The message list, capacity 4.
 OxGList<OxMsgRecord_s*> OxMsg::msgList;
