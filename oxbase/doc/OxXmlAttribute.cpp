@@ -2,6 +2,9 @@
 
 #include "oxbase/core/OxString.h"
 #include "oxbase/diag/OxPrt.h"
+#include "oxbase/geom/OxColor.h"
+#include "oxbase/geom/OxRot.h"
+#include "oxbase/geom/OxVec.h"
 
 #include <cmath>
 #include <iomanip>
@@ -97,6 +100,36 @@ OxXmlAttribute::OxXmlAttribute(char const* name, unsigned int count, int* values
         storeList(count,
                   [values](unsigned int i) { return toString(static_cast<double>(values[i])); });
     }
+}
+
+OxXmlAttribute::OxXmlAttribute(char const* name, OxColor const& color) : name(trimmedCopy(name)) {
+    double channels[3] = {0.0, 0.0, 0.0};
+    color.getColor(channels[0], channels[1], channels[2]);
+    storeJoined(3, channels);
+}
+
+OxXmlAttribute::OxXmlAttribute(char const* name, OxRot const& rotation) : name(trimmedCopy(name)) {
+    double const(&m)[3][3] = rotation.getValue();
+    double elements[9];
+    for (unsigned int i = 0; i < 9; i++) {
+        elements[i] = m[i / 3][i % 3];
+    }
+    storeJoined(9, elements);
+}
+
+OxXmlAttribute::OxXmlAttribute(char const* name, OxVec2d const& vector) : name(trimmedCopy(name)) {
+    double coordinates[2] = {vector[0], vector[1]};
+    storeJoined(2, coordinates);
+}
+
+OxXmlAttribute::OxXmlAttribute(char const* name, OxVec3d const& vector) : name(trimmedCopy(name)) {
+    double coordinates[3] = {vector[0], vector[1], vector[2]};
+    storeJoined(3, coordinates);
+}
+
+OxXmlAttribute::OxXmlAttribute(char const* name, OxVec4d const& vector) : name(trimmedCopy(name)) {
+    double coordinates[4] = {vector[0], vector[1], vector[2], vector[3]};
+    storeJoined(4, coordinates);
 }
 
 OxXmlAttribute::~OxXmlAttribute() {

@@ -4,6 +4,8 @@
 #include "oxbase/core/OxSystem.h"
 #include "oxbase/diag/OxPrt.h"
 #include "oxbase/doc/OxXmlFile.h"
+#include "oxbase/geom/OxColor.h"
+#include "oxbase/geom/OxVec.h"
 
 #include <cstdlib>
 #include <cstring>
@@ -248,6 +250,62 @@ OxBool OxXmlElement::getIndices(OxGList<unsigned int>* indices) const {
     return OxToBool(found > 0);
 }
 
+OxBool OxXmlElement::getColor(OxColor& color) const {
+    double rgb[3];
+    int result = readNumbers(OxXmlFile::OX_XML_FIELD_COLOR, rgb, 3);
+    if (result > 0) {
+        color.setColor(rgb[0], rgb[1], rgb[2]);
+    }
+    return OxToBool(result >= 0);
+}
+
+OxBool OxXmlElement::getPoint(OxVec2d& point) const {
+    return getPoint(OxXmlFile::OX_XML_FIELD_VEC2D, point);
+}
+
+OxBool OxXmlElement::getPoint(OxVec3d& point) const {
+    return getPoint(OxXmlFile::OX_XML_FIELD_VEC3D, point);
+}
+
+OxBool OxXmlElement::getPoint(OxVec4d& point) const {
+    return getPoint(OxXmlFile::OX_XML_FIELD_VEC4D, point);
+}
+
+OxBool OxXmlElement::getPoint(char const* attributeName, OxVec2d& point) const {
+    if (attributeName == nullptr) {
+        return OxFalse;
+    }
+    double xy[2];
+    int result = readNumbers(attributeName, xy, 2);
+    if (result > 0) {
+        point.setValue(xy[0], xy[1]);
+    }
+    return OxToBool(result >= 0);
+}
+
+OxBool OxXmlElement::getPoint(char const* attributeName, OxVec3d& point) const {
+    if (attributeName == nullptr) {
+        return OxFalse;
+    }
+    double xyz[3];
+    int result = readNumbers(attributeName, xyz, 3);
+    if (result > 0) {
+        point.setValue(xyz[0], xyz[1], xyz[2]);
+    }
+    return OxToBool(result >= 0);
+}
+
+OxBool OxXmlElement::getPoint(char const* attributeName, OxVec4d& point) const {
+    if (attributeName == nullptr) {
+        return OxFalse;
+    }
+    double xyzw[4];
+    int result = readNumbers(attributeName, xyzw, 4);
+    if (result > 0) {
+        point.setValue(xyzw[0], xyzw[1], xyzw[2], xyzw[3]);
+    }
+    return OxToBool(result >= 0);
+}
 void OxXmlElement::dumpNode(std::ostrstream& stream) const {
     if (name != nullptr) {
         oxIndent(stream) << "XML Element: \"" << name << "\"";

@@ -1,6 +1,9 @@
 #include "oxbase/doc/OxXmlAttribute.h"
 #include "oxbase/core/OxString.h"
 #include "oxbase/diag/OxPrt.h"
+#include "oxbase/geom/OxColor.h"
+#include "oxbase/geom/OxRot.h"
+#include "oxbase/geom/OxVec.h"
 #include "support/OxTestSupport.h"
 
 #include <gtest/gtest.h>
@@ -86,6 +89,15 @@ TEST(OxXmlAttributeTest, ListForms) {
     EXPECT_EQ(OxXmlAttribute("v", 0, values).getValue(), nullptr);
     EXPECT_EQ(OxXmlAttribute("v", 3, static_cast<double*>(nullptr)).getValue(), nullptr);
     EXPECT_EQ(OxXmlAttribute("v", 3, static_cast<int*>(nullptr)).getValue(), nullptr);
+}
+
+TEST(OxXmlAttributeTest, GeometryForms) {
+    EXPECT_EQ(valueOf(OxXmlAttribute("vec2d", OxVec2d(1.0, -0.5))), "1.0 -0.5");
+    EXPECT_EQ(valueOf(OxXmlAttribute("vec3d", OxVec3d(1.0, 2.5, -3.0))), "1.0 2.5 -3.0");
+    EXPECT_EQ(valueOf(OxXmlAttribute("vec4d", OxVec4d(0.0, 1.0, 2.0, 0.125))), "0.0 1.0 2.0 0.125");
+    EXPECT_EQ(valueOf(OxXmlAttribute("color", OxColor(0.5, 0.25, 1.0))), "0.5 0.25 1.0");
+    OxRot rotation;
+    EXPECT_EQ(valueOf(OxXmlAttribute("matrix", rotation)), "1.0 0.0 0.0 0.0 1.0 0.0 0.0 0.0 1.0");
 }
 
 TEST(OxXmlAttributeTest, TrimmingSettingAndWriting) {

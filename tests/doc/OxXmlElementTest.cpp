@@ -1,5 +1,7 @@
 #include "oxbase/doc/OxXmlElement.h"
 #include "oxbase/diag/OxPrt.h"
+#include "oxbase/geom/OxColor.h"
+#include "oxbase/geom/OxVec.h"
 
 #include <gtest/gtest.h>
 
@@ -99,6 +101,39 @@ TEST(OxXmlElementTest, LookupsByName) {
     EXPECT_EQ(element.getName(), nullptr);
 }
 
+TEST(OxXmlElementTest, PointsAndColours) {
+    OxVec3d p(9.0, 9.0, 9.0);
+    EXPECT_EQ(OxXmlElement("e").getPoint(p), OxTrue); // missing: untouched
+    EXPECT_EQ(p[0], 9.0);
+    EXPECT_EQ(withAttribute("vec3d", "1 2")->getPoint(p), OxFalse);
+    EXPECT_EQ(p[0], 9.0);
+    EXPECT_EQ(withAttribute("vec3d", "1,2,3")->getPoint(p), OxFalse);
+    EXPECT_EQ(withAttribute("vec3d", "1 2 3 4")->getPoint(p), OxTrue);
+    EXPECT_EQ(p[0], 1.0);
+    EXPECT_EQ(p[1], 2.0);
+    EXPECT_EQ(p[2], 3.0);
+    EXPECT_EQ(withAttribute("vec3d", "1\t2  x3")->getPoint(p), OxTrue); // no number counts 0
+    EXPECT_EQ(p[2], 0.0);
+    EXPECT_EQ(withAttribute("vec3d", "   ")->getPoint(p), OxFalse); // empty value: no copy
+    EXPECT_EQ(withAttribute("at", "1 2 3")->getPoint(nullptr, p), OxFalse);
+
+    OxVec2d q;
+    EXPECT_EQ(withAttribute("vec2d", "0.5 -1.5e1")->getPoint(q), OxTrue);
+    EXPECT_EQ(q[0], 0.5);
+    EXPECT_EQ(q[1], -15.0);
+    OxVec4d r;
+    EXPECT_EQ(withAttribute("vec4d", "1 2 3")->getPoint(r), OxFalse);
+    EXPECT_EQ(withAttribute("w", "1 2 3 4")->getPoint("w", r), OxTrue);
+    EXPECT_EQ(r[3], 4.0);
+
+    OxColor color(0.0, 0.0, 0.0);
+    EXPECT_EQ(withAttribute("color", "0.5 0.25 1 7")->getColor(color), OxTrue);
+    double red = 0, green = 0, blue = 0;
+    color.getColor(red, green, blue);
+    EXPECT_EQ(red, 0.5);
+    EXPECT_EQ(green, 0.25);
+    EXPECT_EQ(blue, 1.0);
+}
 TEST(OxXmlElementTest, IndexLists) {
     // The list form with its line end, and the int array form.
     auto element = std::make_unique<OxXmlElement>("e");
