@@ -165,7 +165,8 @@ void releaseHeap(bool coldHeap) {
     if (coldHeap) {
         malloc_trim(0);
     } else {
-        void* large = std::malloc(std::size_t(1) << 20);
+        // volatile: a malloc and free of an unused block is otherwise elided.
+        void* volatile large = std::malloc(std::size_t(1) << 20);
         std::free(large);
     }
 }
