@@ -33,11 +33,12 @@ TEST(OxDefaultMessages, EveryLoggedNumberHasAMatchingText) {
     const struct {
         unsigned int number;
         const char* arguments;
-    } logged[] = {{1, "s"},   {2, "s"},   {3, "s"},   {18, ""},     {19, ""},     {20, ""},
-                  {147, ""},  {152, ""},  {153, ""},  {169, ""},    {179, "s"},   {180, "s"},
-                  {181, "s"}, {182, "s"}, {228, "s"}, {293, "sus"}, {294, "suu"}, {344, "ss"},
-                  {484, "s"}, {560, ""},  {561, ""},  {562, ""},    {564, ""},    {566, "suus"},
-                  {578, "s"}, {579, "s"}};
+    } logged[] = {{1, "s"},      {2, "s"},     {3, "s"},    {18, ""},      {19, ""},
+                  {20, ""},      {147, ""},    {152, ""},   {153, ""},     {169, ""},
+                  {179, "s"},    {180, "s"},   {181, "s"},  {182, "s"},    {228, "s"},
+                  {293, "sus"},  {294, "suu"}, {344, "ss"}, {484, "s"},    {560, ""},
+                  {561, ""},     {562, ""},    {564, ""},   {566, "suus"}, {567, "suuss"},
+                  {568, "suus"}, {569, "suu"}, {578, "s"},  {579, "s"}};
     // The texts as they stand in the file, continuation lines included.
     std::string file = oxtest::readFile(oxtest::dataFile("oxbase.msg"));
     for (const auto& entry : logged) {

@@ -1,0 +1,18 @@
+// The umbrella header stands on its own and reaches every subsystem.
+#include "oxbase/OxBase.h"
+
+#include <gtest/gtest.h>
+
+TEST(OxBaseHeader, EverySubsystemIsReachable) {
+    OxGList<unsigned int> list;
+    EXPECT_EQ(list.append(3u), 0u);
+    OxRangeList ranges("1-3,5", "integer");
+    EXPECT_EQ(ranges.isValid(), OxTrue);
+    EXPECT_EQ(ranges.isInRange(2), OxTrue);
+    EXPECT_EQ(OX_IDENTITY_3X3_MATRIX.isIdentity(), OxTrue);
+    OxXmlElement element("part");
+    EXPECT_EQ(element.isNamed("part"), OxTrue);
+    char* text = OxString::toString(2.5);
+    EXPECT_STREQ(text, "2.5");
+    delete[] text;
+}
