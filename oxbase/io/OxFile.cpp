@@ -395,3 +395,15 @@ char* OxFile::findFile(const char* name, const OxGList<char*>& directories) {
     }
     return nullptr;
 }
+
+void OxFile::logStreamState(std::ios_base::iostate state) {
+    if ((state & std::ios_base::eofbit) != 0) {
+        OxMsg::Log(18);
+    }
+    if ((state & std::ios_base::failbit) != 0) {
+        OxMsg::Log(19);
+    }
+    if ((state & std::ios_base::badbit) != 0) {
+        OxMsg::Log(20);
+    }
+}

@@ -20,6 +20,8 @@
 #include "oxbase/core/OxGList.h"
 #include "oxbase/core/OxTypes.h"
 
+#include <ios>
+
 class OxFile {
 public:
     /// How a stream opens its file. The streams treat every value other than
@@ -95,11 +97,15 @@ public:
     static char* findFile(const char* name, const OxGList<char*>& directories);
     /// Collects the files below `directory` that end in `extension` into
     /// `files`. Rests on the file tree walk and is defined with it
-    /// (oxbase/io/OxFileTreeWalk.cpp).
+    /// (oxbase/io/OxFileFind.cpp).
     static OxBool findFilesByExtension(const char* directory, OxGList<char*>& files,
                                        const char* extension, OxBool recursive);
 
 protected:
+    /// Logs the flags of a stream state by number: 18 end of file, 19
+    /// failure, 20 bad, each that is set, in that order.
+    static void logStreamState(std::ios_base::iostate state);
+
     char* filename; ///< owned copy of the name, may be null
 };
 

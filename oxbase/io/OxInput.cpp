@@ -331,14 +331,5 @@ void OxInput::readState() const {
     if (stream == nullptr) {
         return;
     }
-    std::ios_base::iostate state = stream->rdstate();
-    if ((state & std::ios_base::eofbit) != 0) {
-        OxMsg::Log(18);
-    }
-    if ((state & std::ios_base::failbit) != 0) {
-        OxMsg::Log(19);
-    }
-    if ((state & std::ios_base::badbit) != 0) {
-        OxMsg::Log(20);
-    }
+    logStreamState(stream->rdstate());
 }
