@@ -71,7 +71,10 @@ size_t OxString::getLength() const {
 }
 
 OxString& OxString::operator=(const OxString& other) {
-    return *this = other.str;
+    if (this != &other) {
+        *this = other.str;
+    }
+    return *this;
 }
 
 OxString& OxString::operator=(const char* text) {
@@ -223,6 +226,7 @@ char* OxString::combine(const char* first, const char* second) {
         return nullptr;
     }
     char* joined = new char[a + b + 1];
+    // NOLINTNEXTLINE(bugprone-not-null-terminated-result): the terminator comes with `second`
     std::memcpy(joined, first, a);
     std::memcpy(joined + a, second, b + 1);
     return joined;
@@ -375,7 +379,9 @@ unsigned int OxString::tr(char* text, const char* from, const char* to, OxBool s
     unsigned int count = 0;
     bool afterFirstEntry = false;
     for (size_t i = 0; text[i] != '\0'; i++) {
-        const void* hit = std::memchr(from, text[i], n);
+        // Only the first n entries of `from` take part: no terminator is wanted here.
+        const void* hit =
+            std::memchr(from, text[i], n); // NOLINT(bugprone-not-null-terminated-result)
         if (hit == nullptr) {
             afterFirstEntry = false;
             continue;

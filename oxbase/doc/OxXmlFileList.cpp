@@ -5,7 +5,7 @@
 
 #include <cstring>
 
-OxXmlFileList::OxXmlFileList() : OxFileList() {
+OxXmlFileList::OxXmlFileList() {
     ftwCallback = filterXMLFileList;
 }
 

@@ -18,7 +18,7 @@ public:
     OxXmlFileList();
     /// As OxFileList(listFile), with the same filter.
     explicit OxXmlFileList(char const* listFile);
-    virtual ~OxXmlFileList();
+    ~OxXmlFileList() override;
 
 private:
     friend class OxXmlFileListTestAccess;

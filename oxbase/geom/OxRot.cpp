@@ -167,7 +167,9 @@ OxRot::OxRot(double m00, double m01, double m02, double m10, double m11, double 
 }
 
 const OxRot& OxRot::operator=(const OxRot& other) {
-    copyMatrix<3>(m, other.m);
+    if (this != &other) {
+        copyMatrix<3>(m, other.m);
+    }
     return *this;
 }
 
@@ -383,7 +385,9 @@ OxRot2d::OxRot2d(double m00, double m01, double m10, double m11) {
 }
 
 const OxRot2d& OxRot2d::operator=(const OxRot2d& other) {
-    copyMatrix<2>(m, other.m);
+    if (this != &other) {
+        copyMatrix<2>(m, other.m);
+    }
     return *this;
 }
 

@@ -112,6 +112,7 @@ OxBool OxVec2d::isZero() const {
 OxBool OxVec2d::isIdentity() const {
     return isZero();
 }
+// NOLINTNEXTLINE(performance-unnecessary-value-param): by value in the public signature
 OxBool OxVec2d::equals(OxVec2d other, double tolerance) const {
     return OxToBool((*this - other).length() <= tolerance);
 }
@@ -249,6 +250,7 @@ std::ostream& operator<<(std::ostream& s, const OxVec2d& v) {
 
 OxVec3d::OxVec3d(double xValue, double yValue, double zValue) : x(xValue), y(yValue), z(zValue) {}
 OxVec3d::OxVec3d(double const* const values) : x(values[0]), y(values[1]), z(values[2]) {}
+// NOLINTNEXTLINE(performance-unnecessary-value-param): by value in the public signature
 OxVec3d::OxVec3d(OxVec3d from, OxVec3d to) : x(to.x - from.x), y(to.y - from.y), z(to.z - from.z) {}
 
 const OxVec3d& OxVec3d::operator=(const OxVec3d& other) {
@@ -289,6 +291,7 @@ OxBool OxVec3d::isZero() const {
 OxBool OxVec3d::isIdentity() const {
     return isZero();
 }
+// NOLINTNEXTLINE(performance-unnecessary-value-param): by value in the public signature
 OxBool OxVec3d::equals(OxVec3d other, double tolerance) const {
     return OxToBool((*this - other).length() <= tolerance);
 }
@@ -428,6 +431,7 @@ std::ostream& operator<<(std::ostream& s, const OxVec3d& v) {
 OxVec4d::OxVec4d(double xValue, double yValue, double zValue, double wValue)
     : x(xValue), y(yValue), z(zValue), w(wValue) {}
 OxVec4d::OxVec4d(double const* const v) : x(v[0]), y(v[1]), z(v[2]), w(v[3]) {}
+// NOLINTNEXTLINE(performance-unnecessary-value-param): by value in the public signature
 OxVec4d::OxVec4d(OxVec3d v, double weight) {
     setValue(v, weight);
 }
@@ -454,6 +458,7 @@ OxVec4d& OxVec4d::setValue(float const* const v) {
     return setValue(v[0], v[1], v[2], v[3]);
 }
 
+// NOLINTNEXTLINE(performance-unnecessary-value-param): by value in the public signature
 OxVec4d& OxVec4d::setValue(OxVec3d v, double weight) {
     if (std::fabs(weight) > OxLimits::OxEPSZero) {
         return setValue(weight * v.x, weight * v.y, weight * v.z, weight);
@@ -475,6 +480,7 @@ OxBool OxVec4d::isIdentity() const {
     return OxToBool(allZero<4>(*this));
 }
 
+// NOLINTNEXTLINE(performance-unnecessary-value-param): by value in the public signature
 OxBool OxVec4d::equals(OxVec4d other, double tolerance) const {
     OxVec4d d(x - other.x, y - other.y, z - other.z, w - other.w);
     OxVec3d e;

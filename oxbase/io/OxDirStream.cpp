@@ -35,6 +35,7 @@ OxDirStream* OxDirStream::opendir(const char* name) {
         errno = ENOMEM;
         return nullptr;
     }
+    // NOLINTNEXTLINE(bugprone-not-null-terminated-result): strcpy below terminates it
     std::memcpy(pattern, name, length);
     std::strcpy(pattern + length, endsInSeparator ? "*" : "/*");
     stream->pattern = pattern;

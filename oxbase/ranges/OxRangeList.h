@@ -53,7 +53,7 @@ public:
     /// `numbers` gives a valid empty list.
     OxRangeList(OxGList<unsigned int>& numbers, char const* typeName);
     /// Releases the records and a tree that exists.
-    ~OxRangeList();
+    ~OxRangeList() override;
 
     OxRangeList(const OxRangeList&) = delete;
     OxRangeList& operator=(const OxRangeList&) = delete;
