@@ -55,6 +55,28 @@ OxPrt::~OxPrt() {
     curpos = 0;
 }
 
+// After a flush the object holds a stream as a new one would be: empty, in
+// a clean state, with the format of a new stream (general notation,
+// precision 6, no width, blank fill, decimal). A stream whose text stayed
+// small is reset in place, which spares the construction of a stream for
+// every line of a writer; one that grew large is replaced, so that its
+// memory goes back at once.
+void OxPrt::renewStream() {
+    constexpr std::streamsize kReuseLimit = 65536;
+    str->freeze(false);
+    if (str->pcount() > kReuseLimit) {
+        delete str;
+        newStream();
+        return;
+    }
+    str->seekp(0);
+    str->clear();
+    str->flags(std::ios::skipws | std::ios::dec);
+    str->precision(6);
+    str->width(0);
+    str->fill(' ');
+}
+
 void OxPrt::newStream() {
     str = new std::ostrstream;
     // A size request only: the buffer of a dynamic ostrstream grows as needed.
@@ -67,16 +89,12 @@ void OxPrt::flushPrt() {
     if (callback != nullptr) {
         callback(text, userData);
     }
-    str->freeze(false);
-    delete str;
-    newStream();
+    renewStream();
 }
 
 char* OxPrt::flushToString() {
     char* text = OxString::dup(terminateText(str));
-    str->freeze(false);
-    delete str;
-    newStream();
+    renewStream();
     return text;
 }
 

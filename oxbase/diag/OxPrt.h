@@ -75,6 +75,7 @@ private:
     static OxPrt tracePrt; // defined in oxbase/core/OxStatics.cpp
 
     void newStream();
+    void renewStream();
     static void moveIndent(short to);
 
     int bufferSize = 2010000;
