@@ -122,7 +122,7 @@ struct ChildReport {
 };
 
 struct RowResult {
-    const RowSpec* spec = nullptr;
+    const RowSpec* plan = nullptr;
     std::string status; // "" when measured, else "not built", "timeout", ...
     double median = 0.0;
     double amount = 0.0;
@@ -220,11 +220,11 @@ ChildReport childWork(const Entry& entry, const Corpus& corpus, int runs, bool m
     return report;
 }
 
-RowResult runRow(const RowSpec& spec, const Corpus& corpus, const Options& options) {
+RowResult runRow(const RowSpec& plan, const Corpus& corpus, const Options& options) {
     RowResult result;
-    result.spec = &spec;
-    bool memory = std::strcmp(spec.caseName, "xml-read-memory") == 0;
-    const Entry* entry = findEntry(memory ? "xml-read" : spec.caseName, spec.impl);
+    result.plan = &plan;
+    bool memory = std::strcmp(plan.caseName, "xml-read-memory") == 0;
+    const Entry* entry = findEntry(memory ? "xml-read" : plan.caseName, plan.impl);
     if (entry == nullptr) {
         result.status = "not built";
         return result;
@@ -462,14 +462,14 @@ std::string failureStatus(bool timedOut, int timeoutSeconds) {
 }
 
 // Times every implementation of one case in turns; fills `results`, which
-// holds one entry per row of the case, with `spec` set.
+// holds one entry per row of the case, with `plan` set.
 void runCaseInterleaved(std::vector<RowResult*>& results, const Corpus& corpus,
                         const Options& options) {
     std::vector<Worker> workers;
     for (RowResult* r : results) {
         Worker w;
         w.result = r;
-        const Entry* entry = findEntry(r->spec->caseName, r->spec->impl);
+        const Entry* entry = findEntry(r->plan->caseName, r->plan->impl);
         if (entry == nullptr) {
             r->status = "not built";
             workers.push_back(w);
@@ -633,11 +633,11 @@ void verdict(const RowResult& r, const std::vector<RowResult>& all, std::string&
              std::string& target) {
     const RowResult* ref = nullptr;
     for (const RowResult& o : all) {
-        if (std::strcmp(o.spec->caseName, r.spec->caseName) == 0 && o.spec->reference) {
+        if (std::strcmp(o.plan->caseName, r.plan->caseName) == 0 && o.plan->reference) {
             ref = &o;
         }
     }
-    bool memory = std::strcmp(r.spec->caseName, "xml-read-memory") == 0;
+    bool memory = std::strcmp(r.plan->caseName, "xml-read-memory") == 0;
     double value = 0.0;
     bool haveRatio = false;
     if (r.status.empty() && ref != nullptr && ref->status.empty()) {
@@ -647,15 +647,15 @@ void verdict(const RowResult& r, const std::vector<RowResult>& all, std::string&
             haveRatio = true;
         } else if (!memory && r.median > 0.0) {
             value = ref->median / r.median;
-            ratio = r.spec->reference ? "1.00x (reference)" : fmt("%.2fx", value);
+            ratio = r.plan->reference ? "1.00x (reference)" : fmt("%.2fx", value);
             haveRatio = true;
         }
     }
-    target = r.spec->target;
+    target = r.plan->target;
     if (target.empty() || !r.status.empty()) {
         return;
     }
-    std::string caseName = r.spec->caseName;
+    std::string caseName = r.plan->caseName;
     bool met = false;
     bool known = false;
     if (caseName == "xml-read-memory") {
@@ -665,8 +665,8 @@ void verdict(const RowResult& r, const std::vector<RowResult>& all, std::string&
         }
     } else if (caseName == "xml-read-comment") {
         for (const RowResult& o : all) {
-            if (std::strcmp(o.spec->caseName, "xml-read") == 0 &&
-                std::strcmp(o.spec->impl, r.spec->impl) == 0 && o.status.empty()) {
+            if (std::strcmp(o.plan->caseName, "xml-read") == 0 &&
+                std::strcmp(o.plan->impl, r.plan->impl) == 0 && o.status.empty()) {
                 met = r.median <= 2.0 * o.median;
                 known = true;
                 target += fmt(" (%.2fx)", r.median / o.median);
@@ -757,7 +757,7 @@ int main(int argc, char** argv) {
                     results.push_back(runRow(kRows[k], corpus, options));
                 } else {
                     RowResult r;
-                    r.spec = &kRows[k];
+                    r.plan = &kRows[k];
                     results.push_back(r);
                     group.push_back(&results.back());
                 }
@@ -811,14 +811,14 @@ int main(int argc, char** argv) {
         std::string note = r.note;
         // Implementations of one case must agree on what they read.
         for (const RowResult& o : results) {
-            if (&o != &r && o.spec->reference && r.status.empty() && o.status.empty() &&
-                std::strcmp(o.spec->caseName, r.spec->caseName) == 0 && o.check != 0.0 &&
+            if (&o != &r && o.plan->reference && r.status.empty() && o.status.empty() &&
+                std::strcmp(o.plan->caseName, r.plan->caseName) == 0 && o.check != 0.0 &&
                 r.check != 0.0 && o.check != r.check) {
                 note += (note.empty() ? "" : "; ") + fmt("check %.17g", r.check) +
                         fmt(" differs from reference %.17g", o.check);
             }
         }
-        std::cout << "| " << r.spec->caseName << " | " << r.spec->impl << " | " << median << " | "
+        std::cout << "| " << r.plan->caseName << " | " << r.plan->impl << " | " << median << " | "
                   << throughput << " | " << ratio << " | " << target
                   << (note.empty() ? "" : " (" + note + ")") << " |\n";
     }

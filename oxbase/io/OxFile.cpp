@@ -261,12 +261,12 @@ char* OxFile::makeFileSpec(const char* directory, const char* file) {
     if (file == nullptr) {
         return OxString::dup(directory);
     }
-    std::string spec = directory;
-    if (spec.empty() || spec.back() != kSeparator) {
-        spec += kSeparator;
+    std::string fileSpec = directory;
+    if (fileSpec.empty() || fileSpec.back() != kSeparator) {
+        fileSpec += kSeparator;
     }
-    spec += file;
-    return newText(spec.c_str(), spec.size());
+    fileSpec += file;
+    return newText(fileSpec.c_str(), fileSpec.size());
 }
 
 char* OxFile::pathToFileName(const char* path) {
@@ -387,11 +387,11 @@ char* OxFile::findFile(const char* name, const OxGList<char*>& directories) {
         if (directory == nullptr) {
             continue;
         }
-        char* spec = makeFileSpec(directory, name);
-        if (spec != nullptr && isRegularFile(spec) == OxTrue) {
-            return spec;
+        char* fileSpec = makeFileSpec(directory, name);
+        if (fileSpec != nullptr && isRegularFile(fileSpec) == OxTrue) {
+            return fileSpec;
         }
-        delete[] spec;
+        delete[] fileSpec;
     }
     return nullptr;
 }

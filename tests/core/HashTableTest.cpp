@@ -39,7 +39,7 @@ std::vector<std::string> collisions(unsigned int count, unsigned int& home) {
 
 } // namespace
 
-TEST(HashTableTest, PrimesAsDescribed) {
+TEST(HashTableTest, PrimesAndNextPrime) {
     EXPECT_EQ(HashTable::nextPrime(0), 1u);
     EXPECT_EQ(HashTable::nextPrime(8), 11u);
     EXPECT_EQ(HashTable::nextPrime(26), 29u);
