@@ -9,8 +9,8 @@
 // accept the same Windows-form paths on POSIX.
 //
 //   char * dir = OxFile::getBaseName("parts\\wheel.xml");   // "parts"
-//   char * spec = OxFile::makeFileSpec(dir, "hub.xml");      // "parts\\hub.xml"
-//   delete[] dir; delete[] spec;
+//   char * path = OxFile::makeFileSpec(dir, "hub.xml");      // "parts\\hub.xml"
+//   delete[] dir; delete[] path;
 //
 // Every operation that returns `char *` returns a new array (array delete is
 // the caller's); an empty result is null, never an empty text, unless stated.
