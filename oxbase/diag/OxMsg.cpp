@@ -389,9 +389,13 @@ void OxMsg::LogCommon(OxBool force, unsigned int number, va_list arguments) {
         error_code = severity;
     }
     if (logFile != nullptr) {
-        *logFile << std::right << std::setfill(' ') << std::setw(3) << number << std::left << letter
-                 << ": " << buf << "\n"
-                 << std::flush;
+        // The number right-adjusted in a field of at least 3, the letter, ": ".
+        char head[24];
+        int headLength = std::snprintf(head, sizeof head, "%3u%c: ", number, letter);
+        logFile->write(head, headLength);
+        logFile->write(buf, static_cast<std::streamsize>(std::strlen(buf)));
+        logFile->put('\n');
+        logFile->flush();
     }
     if (pMsgCallback != nullptr) {
         pMsgCallback(buf, pUserData);

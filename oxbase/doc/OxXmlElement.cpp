@@ -202,6 +202,16 @@ void OxXmlElement::setValue(char const* newValue) {
     value = trimmedCopy(newValue);
 }
 
+void OxXmlElement::adoptValue(char* newValue) {
+    delete[] value;
+    value = nullptr;
+    if (newValue == nullptr || *newValue == '\0') {
+        delete[] newValue; // an empty text is no text, as with setValue
+        return;
+    }
+    value = OxString::stripWhite(newValue);
+}
+
 void OxXmlElement::setXsiType(char const* newType) {
     delete[] xsiType;
     xsiType = nullptr;

@@ -87,6 +87,9 @@ public:
     /// Each replaces its text by a trimmed copy (null or empty: none).
     void setName(char const* newName);
     void setValue(char const* newValue);
+    /// As setValue, but takes over `newValue`, a new[] array, and trims it in
+    /// place instead of copying it: for long texts gathered by a reader.
+    void adoptValue(char* newValue);
     void setXsiType(char const* newType);
 
     // ---- Typed getters ----

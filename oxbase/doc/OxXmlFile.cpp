@@ -117,6 +117,22 @@ public:
     bool append(char c) { return append(&c, 1); }
     /// The text, NUL-terminated; "" while nothing was appended.
     char const* text() const { return data != nullptr ? data : ""; }
+    /// Tells the buffer that its text will not grow beyond `maxLength`
+    /// characters (what is left of the input bounds a gathered text).
+    void expectAtMost(size_t maxLength) { ceiling = maxLength + 1; }
+    /// Hands the text over as a new[] array when that saves a copy of a long
+    /// text (it fills at least half of its array); null otherwise, and the
+    /// caller copies text().
+    char* releaseLong() {
+        if (data == nullptr || length < kLongText || length < capacity / 2) {
+            return nullptr;
+        }
+        char* text = data;
+        data = nullptr;
+        length = 0;
+        capacity = 0;
+        return text;
+    }
 
 private:
     bool reserve(size_t needed) {
@@ -126,6 +142,11 @@ private:
         size_t grown = capacity < 64 ? 64 : capacity;
         while (grown < needed) {
             grown *= 2;
+        }
+        // A long text jumps to the most it can still become, so that it is
+        // neither copied at every doubling nor given twice the room it needs.
+        if (grown > kLongText && ceiling >= needed) {
+            grown = ceiling;
         }
         char* bigger = new (std::nothrow) char[grown];
         if (bigger == nullptr) {
@@ -140,9 +161,11 @@ private:
         return true;
     }
 
+    static constexpr size_t kLongText = 1u << 20;
     char* data = nullptr;
     size_t length = 0;
     size_t capacity = 0;
+    size_t ceiling = 0;
 };
 } // namespace
 
@@ -238,6 +261,11 @@ private:
         return Line;
     }
 
+public:
+    /// Bytes not yet handed out as lines: the rest of the buffer and of the file.
+    size_t unconsumed() const { return static_cast<size_t>(remaining) + (filled - lineStart); }
+
+private:
     OxInput& input;
     long long remaining = 0;
     char* buffer = nullptr;
@@ -654,6 +682,7 @@ int OxXmlReader::doComment(bool cdata) {
             new (std::nothrow) OxXmlElement(OxXmlElement::XML_TYPE_COMMENT, nullptr);
         attach(commentNode[kind]);
         commentText[kind].clear();
+        commentText[kind].expectAtMost(length + source.unconsumed());
         commentText[kind].append(cursor, length);
     } else {
         commentText[kind].append('\n');
@@ -760,7 +789,12 @@ void OxXmlReader::attach(OxXmlElement* node) {
 void OxXmlReader::finishComment(bool cdata) {
     int kind = cdata ? 1 : 0;
     if (commentNode[kind] != nullptr) {
-        commentNode[kind]->setValue(commentText[kind].text());
+        char* whole = commentText[kind].releaseLong();
+        if (whole != nullptr) {
+            commentNode[kind]->adoptValue(whole);
+        } else {
+            commentNode[kind]->setValue(commentText[kind].text());
+        }
     }
     commentNode[kind] = nullptr;
     commentOpen[kind] = false;
