@@ -1,5 +1,4 @@
 #include "oxbase/doc/OxCsvFile.h"
-#include "oxbase/diag/OxMsg.h"
 #include "oxbase/doc/OxXmlAttribute.h"
 #include "oxbase/doc/OxXmlElement.h"
 #include "support/OxTestSupport.h"
@@ -12,30 +11,13 @@
 
 namespace {
 
-void collect(const char* text, void* userData) {
-    static_cast<std::vector<std::string>*>(userData)->push_back(text);
-}
-
 /// A scratch directory with a running message subsystem that records what is
 /// logged; the texts spell the numbers ("m578 path").
 class CsvTest : public testing::Test {
 protected:
-    oxtest::TempDir dir;
-    std::vector<std::string> messages;
-    std::unique_ptr<OxMsg> msg;
-
-    void SetUp() override {
-        oxtest::writeFile(dir.file("csv.msg"), "1,I,0m1 %s\n2,I,0m2 %s\n3,I,0m3 %s\n18,I,0m18\n"
-                                               "19,I,0m19\n20,I,0m20\n578,I,0m578 %s\n");
-        msg = std::make_unique<OxMsg>(dir.file("csv.msg").c_str(), nullptr, "csv.log",
-                                      dir.path().c_str());
-        OxMsg::setMsgCallback(collect);
-        OxMsg::setMsgCallbackUserData(&messages);
-    }
-    void TearDown() override {
-        OxMsg::setMsgCallback(nullptr);
-        msg.reset();
-    }
+    oxtest::MessageLog log{"1,I,0m1 %s\n2,I,0m2 %s\n3,I,0m3 %s\n18,I,0m18\n19,I,0m19\n20,I,0m20\n"
+                           "578,I,0m578 %s\n"};
+    const oxtest::TempDir& dir = log.dir;
 
     /// Reads `text` as a file into `csv` (opened on it); returns readFile's result.
     OxBool read(std::unique_ptr<OxCsvFile>& csv, const std::string& text, char sep = ',') {
@@ -90,10 +72,10 @@ TEST_F(CsvTest, WriteBackPadsMissingFieldsAtTheEnd) {
     ASSERT_EQ(read(csv, "a,b,c\n1,,3\n"), OxTrue);
     std::string out = dir.file("out.csv");
     ASSERT_EQ(csv->open(out.c_str(), OxFile::OxIOOutput), 0);
-    messages.clear();
+    log.take();
     ASSERT_EQ(csv->writeFile(), OxTrue);
     EXPECT_EQ(oxtest::readFile(out), "a,b,c\n1,3,\n");
-    EXPECT_EQ(messages, std::vector<std::string>{"m578 " + out});
+    EXPECT_EQ(log.take(), std::vector<std::string>{"m578 " + out});
 
     // No columns: the first record's field count is the width; a quoted value
     // is one field, a value with separators is several.

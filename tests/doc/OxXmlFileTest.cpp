@@ -1,5 +1,4 @@
 #include "oxbase/doc/OxXmlFile.h"
-#include "doc/OxXmlTestMessages.h"
 #include "oxbase/diag/OxPrt.h"
 #include "oxbase/io/OxInput.h"
 #include "support/OxTestSupport.h"
@@ -41,7 +40,12 @@ protected:
                std::to_string(offset) + "|" + text;
     }
 
-    oxtest::XmlMessages messages;
+    // Texts that spell out every argument.
+    oxtest::MessageLog messages{"1,I,0open %s\n2,I,0read %s\n3,I,0seek %s\n18,I,0eof\n19,I,0fail\n"
+                                "20,I,0bad\n179,I,0write %s\n560,I,0e560\n561,I,0e561\n"
+                                "562,I,0e562\n564,I,0e564\n566,I,0at %s|%u|%u|%s\n"
+                                "567,I,0mismatch %s|%u|%u|%s|%s\n568,I,0second %s|%u|%u|%s\n"
+                                "569,I,0nul %s|%u|%u\n579,I,0written %s\n"};
 };
 
 const char* const kDecl = "<?xml version=\"1.0\"?>\n";

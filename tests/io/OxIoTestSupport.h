@@ -9,7 +9,6 @@
 
 #include <gtest/gtest.h>
 
-#include <memory>
 #include <string>
 #include <vector>
 
@@ -22,36 +21,22 @@ inline const char* messageFile() {
            "181,I,0m181 %s\n182,I,0m182 %s\n344,I,0m344 %s %s\n484,I,0m484 %s\n";
 }
 
-inline void collect(const char* text, void* userData) {
-    static_cast<std::vector<std::string>*>(userData)->push_back(text);
-}
-
 /// A scratch directory and a running message subsystem that records every
-/// logged text in `messages`.
+/// logged text.
 class IoTest : public testing::Test {
 protected:
-    oxtest::TempDir dir;
-    std::vector<std::string> messages;
-    std::unique_ptr<OxMsg> msg;
+    oxtest::MessageLog log{messageFile()};
+    const oxtest::TempDir& dir = log.dir;
 
-    void SetUp() override {
-        oxtest::writeFile(dir.file("io.msg"), messageFile());
-        msg = std::make_unique<OxMsg>(dir.file("io.msg").c_str(), nullptr, "io.log",
-                                      dir.path().c_str());
-        ASSERT_EQ(OxMsg::isValid(), OxTrue);
-        OxMsg::setMsgCallback(collect);
-        OxMsg::setMsgCallbackUserData(&messages);
-    }
-    void TearDown() override { msg.reset(); }
+    void SetUp() override { ASSERT_EQ(OxMsg::isValid(), OxTrue); }
 
     /// The numbers of the messages so far ("m2 x" gives "2"), then forgets them.
     std::vector<std::string> taken() {
         std::vector<std::string> numbers;
-        for (const std::string& text : messages) {
-            numbers.push_back(text.substr(
-                1, text.find(' ') == std::string::npos ? std::string::npos : text.find(' ') - 1));
+        for (const std::string& text : log.take()) {
+            std::string::size_type space = text.find(' ');
+            numbers.push_back(text.substr(1, space == std::string::npos ? space : space - 1));
         }
-        messages.clear();
         return numbers;
     }
 };

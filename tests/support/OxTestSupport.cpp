@@ -1,5 +1,7 @@
 #include "support/OxTestSupport.h"
 
+#include "oxbase/diag/OxMsg.h"
+
 #include <atomic>
 #include <filesystem>
 #include <fstream>
@@ -64,6 +66,34 @@ std::string streamText(std::ostrstream& stream) {
     std::string copy(text, static_cast<size_t>(stream.pcount()));
     stream.freeze(false);
     return copy;
+}
+
+MessageLog::MessageLog(const std::string& lines) {
+    writeFile(dir.file("test.msg"), lines);
+    msg = std::make_unique<OxMsg>(dir.file("test.msg").c_str(), nullptr, "test.log",
+                                  dir.path().c_str());
+    OxMsg::setMsgCallback([](const char* text, void* userData) {
+        static_cast<std::vector<std::string>*>(userData)->push_back(text);
+    });
+    OxMsg::setMsgCallbackUserData(&texts);
+}
+
+MessageLog::~MessageLog() {
+    OxMsg::setMsgCallback(nullptr);
+}
+
+std::vector<std::string> MessageLog::take() {
+    std::vector<std::string> result;
+    for (std::string text : texts) {
+        while (!text.empty() && text.back() == '\n') {
+            text.pop_back();
+        }
+        if (!text.empty()) {
+            result.push_back(text);
+        }
+    }
+    texts.clear();
+    return result;
 }
 
 } // namespace oxtest

@@ -5,7 +5,11 @@
 
 #include "oxbase/platform/OxStrstream.h"
 
+#include <memory>
 #include <string>
+#include <vector>
+
+class OxMsg;
 
 namespace oxtest {
 
@@ -34,6 +38,26 @@ void writeFile(const std::string& path, const std::string& bytes);
 std::string dataFile(const std::string& name);
 /// The text of an ostrstream so far, without changing its freeze state.
 std::string streamText(std::ostrstream& stream);
+
+/// A running message subsystem on a message file of `lines` (written into
+/// `dir`) that records every logged text.
+class MessageLog {
+public:
+    explicit MessageLog(const std::string& lines);
+    ~MessageLog();
+    MessageLog(const MessageLog&) = delete;
+    MessageLog& operator=(const MessageLog&) = delete;
+
+    /// The texts logged so far without their line ends, leaving out empty
+    /// ones (a print object flushing nothing), then forgets them.
+    std::vector<std::string> take();
+
+    TempDir dir;
+
+private:
+    std::vector<std::string> texts;
+    std::unique_ptr<OxMsg> msg;
+};
 
 } // namespace oxtest
 
