@@ -50,36 +50,37 @@ TEST_F(IoTest, EveryValueTypeHasItsByteLayout) {
                                         0,    0,    0,    0,    0,    0,    'x',  'y',  'z'});
     ASSERT_EQ(oxtest::readFile(path), expected);
 
+    // The numbers from the short on, read back from either reader.
+    auto readNumbers = [](auto& reader) {
+        short s = 0;
+        unsigned short us = 0;
+        int i = 0;
+        unsigned int ui = 0;
+        float f = 0;
+        double d = 0;
+        EXPECT_EQ(reader.read(s) + reader.read(us) + reader.read(i) + reader.read(ui) +
+                      reader.read(f) + reader.read(d),
+                  24);
+        EXPECT_EQ(s, -2);
+        EXPECT_EQ(us, 0x1234);
+        EXPECT_EQ(i, -2);
+        EXPECT_EQ(ui, 16909060u);
+        EXPECT_EQ(f, 1.0f);
+        EXPECT_EQ(d, -2.5);
+    };
     OxInput in(path.c_str(), kBinary);
     ASSERT_EQ(in.isGood(), OxTrue);
     EXPECT_EQ(in.getFileLength(), 29);
     char c = 0;
     unsigned char uc = 0;
-    short s = 0;
-    unsigned short us = 0;
-    int i = 0;
-    unsigned int ui = 0;
-    float f = 0;
-    double d = 0;
     char text[4] = {};
     EXPECT_EQ(in.read(c), 1);
     EXPECT_EQ(in.read(uc), 1);
-    EXPECT_EQ(in.read(s), 2);
-    EXPECT_EQ(in.read(us), 2);
-    EXPECT_EQ(in.read(i), 4);
-    EXPECT_EQ(in.read(ui), 4);
-    EXPECT_EQ(in.read(f), 4);
-    EXPECT_EQ(in.read(d), 8);
+    readNumbers(in);
     EXPECT_EQ(in.read(text, 3), 3);
     EXPECT_EQ(in.getFilePosition(), 29);
     EXPECT_EQ(c, 'A');
     EXPECT_EQ(uc, 0xFE);
-    EXPECT_EQ(s, -2);
-    EXPECT_EQ(us, 0x1234);
-    EXPECT_EQ(i, -2);
-    EXPECT_EQ(ui, 16909060u);
-    EXPECT_EQ(f, 1.0f);
-    EXPECT_EQ(d, -2.5);
     EXPECT_STREQ(text, "xyz");
     EXPECT_EQ(in.eof(), OxFalse); // ended exactly at the end: no flag yet
     EXPECT_EQ(in.isGood(), OxTrue);
@@ -88,18 +89,7 @@ TEST_F(IoTest, EveryValueTypeHasItsByteLayout) {
     std::string copy = expected + '\0';
     OxMemory memory(reinterpret_cast<unsigned char*>(&copy[0]), copy.size());
     EXPECT_EQ(memory.seek(2, OxMemory::DIR_BEGIN), OxTrue);
-    EXPECT_EQ(memory.read(s), 2);
-    EXPECT_EQ(memory.read(us), 2);
-    EXPECT_EQ(memory.read(i), 4);
-    EXPECT_EQ(memory.read(ui), 4);
-    EXPECT_EQ(memory.read(f), 4);
-    EXPECT_EQ(memory.read(d), 8);
-    EXPECT_EQ(s, -2);
-    EXPECT_EQ(us, 0x1234);
-    EXPECT_EQ(i, -2);
-    EXPECT_EQ(ui, 16909060u);
-    EXPECT_EQ(f, 1.0f);
-    EXPECT_EQ(d, -2.5);
+    readNumbers(memory);
     EXPECT_EQ(taken(), Numbers{});
 
     // Swapping reverses the bit pattern; twice gives the value back.
