@@ -29,11 +29,7 @@ int keepFiles(const char* path, const OxStat*, OxFileTreeWalkType type, void* li
     return 0;
 }
 
-std::string dumpText(const OxFileList& list) {
-    std::ostrstream stream;
-    list.dump(&stream);
-    return oxtest::streamText(stream);
-}
+using oxtest::dumpText;
 
 } // namespace
 

@@ -17,11 +17,7 @@ OxStat statusOf(std::uint64_t device, std::uint64_t inode) {
     return status;
 }
 
-std::string dumpText(const OxInodeTable& table) {
-    std::ostrstream stream;
-    table.dump(&stream);
-    return oxtest::streamText(stream);
-}
+using oxtest::dumpText;
 
 } // namespace
 

@@ -38,6 +38,12 @@ void writeFile(const std::string& path, const std::string& bytes);
 std::string dataFile(const std::string& name);
 /// The text of an ostrstream so far, without changing its freeze state.
 std::string streamText(std::ostrstream& stream);
+/// What `object.dump` writes to a fresh stream.
+template <class T> std::string dumpText(const T& object) {
+    std::ostrstream stream;
+    object.dump(&stream);
+    return streamText(stream);
+}
 
 /// A running message subsystem on a message file of `lines` (written into
 /// `dir`) that records every logged text.
