@@ -12,6 +12,8 @@
 #ifndef OXTOOL_OXTOOLCOMMAND_H
 #define OXTOOL_OXTOOLCOMMAND_H
 
+#include "oxbase/platform/OxStrstream.h"
+
 #include <string>
 
 /// What a demo step gets: the sample data directory and a scratch directory
@@ -33,6 +35,9 @@ struct OxToolCommand {
 struct OxToolRegistration {
     explicit OxToolRegistration(const OxToolCommand& command);
 };
+
+/// The text written to `stream` so far (the stream stays usable).
+std::string oxtoolStreamText(std::ostrstream& stream);
 
 /// Joins a directory and a file name with '/'.
 std::string oxtoolJoin(const std::string& dir, const std::string& name);

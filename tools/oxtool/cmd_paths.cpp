@@ -63,13 +63,6 @@ int runPaths(int argc, char** argv) {
     return 0;
 }
 
-std::string streamText(std::ostrstream& stream) {
-    stream << std::ends;
-    std::string text = stream.str();
-    stream.freeze(false);
-    return text;
-}
-
 // Demo: a few paths, then typed values written big-endian and read back.
 int demoPaths(const OxToolDemoContext& context) {
     std::string logPath = oxtoolJoin(context.outDir, "paths-demo.log");
@@ -115,7 +108,7 @@ int demoPaths(const OxToolDemoContext& context) {
 
     std::ostrstream hex;
     in.hexDump(&hex);
-    std::fputs(streamText(hex).c_str(), stdout);
+    std::fputs(oxtoolStreamText(hex).c_str(), stdout);
     return 0;
 }
 

@@ -97,13 +97,6 @@ int runRanges(int argc, char** argv) {
     return 0;
 }
 
-std::string streamText(std::ostrstream& stream) {
-    stream << std::ends;
-    std::string text = stream.str();
-    stream.freeze(false);
-    return text;
-}
-
 // Demo: an unordered text with overlaps, compacted, walked, merged with a
 // second set, negated within a span, and dumped.
 int demoRanges(const OxToolDemoContext& context) {
@@ -132,7 +125,7 @@ int demoRanges(const OxToolDemoContext& context) {
     printSet(list);
     std::ostrstream stream;
     list.dump(&stream);
-    std::cout << streamText(stream) << std::flush;
+    std::cout << oxtoolStreamText(stream) << std::flush;
 
     // A text with an error is reported by number (293) and gives an empty set.
     OxRangeList broken("1 , 2", "page");

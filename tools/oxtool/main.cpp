@@ -74,6 +74,13 @@ OxToolRegistration::OxToolRegistration(const OxToolCommand& command) {
     registry().push_back(command);
 }
 
+std::string oxtoolStreamText(std::ostrstream& stream) {
+    stream << std::ends;
+    std::string text = stream.str();
+    stream.freeze(false);
+    return text;
+}
+
 std::string oxtoolJoin(const std::string& dir, const std::string& name) {
     if (dir.empty()) {
         return name;
