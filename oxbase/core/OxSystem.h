@@ -13,6 +13,7 @@
 #define OXBASE_CORE_OXSYSTEM_H
 
 #include "oxbase/core/OxTypes.h"
+#include "oxbase/platform/OxCompiler.h"
 
 #include <cstddef>
 #include <ctime>
@@ -48,11 +49,7 @@ public:
     /// printf into `buffer` of `size` bytes: the number of characters written,
     /// 0 for a null `buffer` or `format` or a `size` of 0 (`buffer` untouched),
     /// -1 when the text does not fit (then `buffer` is empty).
-    static int sprintf(char* buffer, size_t size, const char* format, ...)
-#if defined(__GNUC__)
-        __attribute__((format(printf, 3, 4)))
-#endif
-        ;
+    static int sprintf(char* buffer, size_t size, const char* format, ...) OX_PRINTF_FORMAT(3, 4);
     /// Appends `text` to `target` of `size` bytes; `target`, or null when an
     /// argument is null (target untouched) or the result does not fit (target empty).
     static char* strcat(char* target, size_t size, const char* text);
