@@ -44,7 +44,8 @@ TEST(OxString, BufferMovesBetweenInlineAndHeap) {
     EXPECT_LT(hundred.getString(), reinterpret_cast<const char*>(&hundred + 1));
 
     OxString self("a text of more than sixteen characters");
-    self = self;
+    OxString& alias = self;
+    self = alias; // self-assignment keeps the text
     self = self.getString() + 2; // a piece of its own text
     EXPECT_STREQ(self.getString(), "text of more than sixteen characters");
 
