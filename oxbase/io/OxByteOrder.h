@@ -10,6 +10,7 @@
 #ifndef OXBASE_IO_OXBYTEORDER_H
 #define OXBASE_IO_OXBYTEORDER_H
 
+#include <cstddef>
 #include <cstdint>
 #include <cstring>
 
@@ -47,6 +48,38 @@ template <typename To, typename From> inline To bitCast(From from) {
     To to;
     std::memcpy(&to, &from, sizeof to);
     return to;
+}
+
+/// The unsigned integer of a size, for swapping a value of that size.
+template <std::size_t Size> struct UnsignedOfSize;
+template <> struct UnsignedOfSize<1> { using type = std::uint8_t; };
+template <> struct UnsignedOfSize<2> { using type = std::uint16_t; };
+template <> struct UnsignedOfSize<4> { using type = std::uint32_t; };
+template <> struct UnsignedOfSize<8> { using type = std::uint64_t; };
+
+inline std::uint8_t swap(std::uint8_t v) {
+    return v;
+}
+inline std::uint16_t swap(std::uint16_t v) {
+    return swap16(v);
+}
+inline std::uint32_t swap(std::uint32_t v) {
+    return swap32(v);
+}
+inline std::uint64_t swap(std::uint64_t v) {
+    return swap64(v);
+}
+
+/// The value of type T stored big-endian at `bytes` (sizeof(T) bytes).
+template <typename T> inline T fromBigEndian(const unsigned char* bytes) {
+    using Bits = typename UnsignedOfSize<sizeof(T)>::type;
+    return bitCast<T>(swap(load<Bits>(bytes)));
+}
+
+/// Stores `value` big-endian at `bytes` (sizeof(T) bytes).
+template <typename T> inline void toBigEndian(unsigned char* bytes, T value) {
+    using Bits = typename UnsignedOfSize<sizeof(T)>::type;
+    store(bytes, swap(bitCast<Bits>(value)));
 }
 
 } // namespace OxByteOrder

@@ -9,7 +9,6 @@
 #include <cstring>
 
 using OxByteOrder::bitCast;
-using OxByteOrder::load;
 
 namespace {
 
@@ -102,84 +101,46 @@ bool OxInput::readUnit(unsigned char* unit, long long& result) {
     return readValueBytes(unit, 2, result);
 }
 
+template <class T> long long OxInput::readNumber(T& value) {
+    unsigned char bytes[sizeof(T)];
+    long long result;
+    if (readValueBytes(bytes, sizeof(T), result)) {
+        value = OxByteOrder::fromBigEndian<T>(bytes);
+    }
+    return result;
+}
+
 long long OxInput::read(char& value) {
-    unsigned char bytes[1];
-    long long result;
-    if (readValueBytes(bytes, 1, result)) {
-        value = static_cast<char>(bytes[0]);
-    }
-    return result;
+    return readNumber(value);
 }
-
 long long OxInput::read(unsigned char& value) {
-    unsigned char bytes[1];
-    long long result;
-    if (readValueBytes(bytes, 1, result)) {
-        value = bytes[0];
-    }
-    return result;
+    return readNumber(value);
 }
-
 long long OxInput::read(short& value) {
-    unsigned char bytes[2];
-    long long result;
-    if (readValueBytes(bytes, 2, result)) {
-        value = bitCast<short>(OxByteOrder::swap16(load<std::uint16_t>(bytes)));
-    }
-    return result;
+    return readNumber(value);
 }
-
 long long OxInput::read(unsigned short& value) {
-    unsigned char bytes[2];
-    long long result;
-    if (readValueBytes(bytes, 2, result)) {
-        value = OxByteOrder::swap16(load<std::uint16_t>(bytes));
-    }
-    return result;
+    return readNumber(value);
 }
-
 long long OxInput::read(int& value) {
-    unsigned char bytes[4];
-    long long result;
-    if (readValueBytes(bytes, 4, result)) {
-        value = bitCast<int>(OxByteOrder::swap32(load<std::uint32_t>(bytes)));
-    }
-    return result;
+    return readNumber(value);
 }
-
 long long OxInput::read(unsigned int& value) {
-    unsigned char bytes[4];
-    long long result;
-    if (readValueBytes(bytes, 4, result)) {
-        value = OxByteOrder::swap32(load<std::uint32_t>(bytes));
-    }
-    return result;
+    return readNumber(value);
+}
+long long OxInput::read(float& value) {
+    return readNumber(value);
+}
+long long OxInput::read(double& value) {
+    return readNumber(value);
 }
 
 long long OxInput::read(long long& value) {
     // The 64-bit form of the layout is an unsigned 32-bit value on disk.
-    unsigned char bytes[4];
-    long long result;
-    if (readValueBytes(bytes, 4, result)) {
-        value = static_cast<long long>(OxByteOrder::swap32(load<std::uint32_t>(bytes)));
-    }
-    return result;
-}
-
-long long OxInput::read(float& value) {
-    unsigned char bytes[4];
-    long long result;
-    if (readValueBytes(bytes, 4, result)) {
-        value = swapf(load<float>(bytes));
-    }
-    return result;
-}
-
-long long OxInput::read(double& value) {
-    unsigned char bytes[8];
-    long long result;
-    if (readValueBytes(bytes, 8, result)) {
-        value = swapd(load<double>(bytes));
+    std::uint32_t onDisk = 0;
+    long long result = readNumber(onDisk);
+    if (result == 4) {
+        value = static_cast<long long>(onDisk);
     }
     return result;
 }

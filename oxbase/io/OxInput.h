@@ -92,6 +92,8 @@ private:
     /// Reads `size` bytes for one value into `bytes` by the protocol of the
     /// typed reads; true when the value may be stored. `result` is the count.
     bool readValueBytes(unsigned char* bytes, unsigned int size, long long& result);
+    /// One big-endian value of type T, with the failure protocol of read.
+    template <class T> long long readNumber(T& value);
     /// Reads one 16-bit unit for the character records.
     bool readUnit(unsigned char* unit, long long& result);
 

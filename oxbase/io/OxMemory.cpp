@@ -7,8 +7,6 @@
 #include <cstdint>
 #include <cstring>
 
-using OxByteOrder::bitCast;
-using OxByteOrder::load;
 
 OxMemory::OxMemory(unsigned char* bytes, unsigned int size)
     : buffer(bytes), length(bytes != nullptr ? size : 0), current(bytes) {}
@@ -41,58 +39,37 @@ int OxMemory::read(unsigned char& value) {
     return 1;
 }
 
-int OxMemory::read(short& value) {
-    if (!fits(2)) {
+template <class T> int OxMemory::readNumber(T& value) {
+    if (!fits(sizeof(T))) {
         return 0;
     }
-    value = bitCast<short>(OxByteOrder::swap16(load<std::uint16_t>(current)));
-    current += 2;
-    return 2;
+    value = OxByteOrder::fromBigEndian<T>(current);
+    current += sizeof(T);
+    return static_cast<int>(sizeof(T));
+}
+
+int OxMemory::read(short& value) {
+    return readNumber(value);
 }
 
 int OxMemory::read(unsigned short& value) {
-    if (!fits(2)) {
-        return 0;
-    }
-    value = OxByteOrder::swap16(load<std::uint16_t>(current));
-    current += 2;
-    return 2;
+    return readNumber(value);
 }
 
 int OxMemory::read(int& value) {
-    if (!fits(4)) {
-        return 0;
-    }
-    value = bitCast<int>(OxByteOrder::swap32(load<std::uint32_t>(current)));
-    current += 4;
-    return 4;
+    return readNumber(value);
 }
 
 int OxMemory::read(unsigned int& value) {
-    if (!fits(4)) {
-        return 0;
-    }
-    value = OxByteOrder::swap32(load<std::uint32_t>(current));
-    current += 4;
-    return 4;
+    return readNumber(value);
 }
 
 int OxMemory::read(float& value) {
-    if (!fits(4)) {
-        return 0;
-    }
-    value = swapf(load<float>(current));
-    current += 4;
-    return 4;
+    return readNumber(value);
 }
 
 int OxMemory::read(double& value) {
-    if (!fits(8)) {
-        return 0;
-    }
-    value = swapd(load<double>(current));
-    current += 8;
-    return 8;
+    return readNumber(value);
 }
 
 int OxMemory::read(char* target, unsigned int count) {

@@ -56,6 +56,8 @@ public:
 
 private:
     bool fits(size_t size) const;
+    /// One big-endian value of type T under the bounds rule of read.
+    template <class T> int readNumber(T& value);
 
     unsigned char* buffer;
     size_t length;

@@ -9,8 +9,6 @@
 #include <cstring>
 #include <string>
 
-using OxByteOrder::bitCast;
-using OxByteOrder::store;
 
 namespace {
 
@@ -98,40 +96,34 @@ OxBool OxOutput::write(unsigned char value) {
     return writeValueBytes(&value, 1);
 }
 
+template <class T> OxBool OxOutput::writeNumber(T value) {
+    unsigned char bytes[sizeof(T)];
+    OxByteOrder::toBigEndian(bytes, value);
+    return writeValueBytes(bytes, sizeof(T));
+}
+
 OxBool OxOutput::write(short value) {
-    unsigned char bytes[2];
-    store(bytes, OxByteOrder::swap16(bitCast<std::uint16_t>(value)));
-    return writeValueBytes(bytes, 2);
+    return writeNumber(value);
 }
 
 OxBool OxOutput::write(unsigned short value) {
-    unsigned char bytes[2];
-    store(bytes, OxByteOrder::swap16(value));
-    return writeValueBytes(bytes, 2);
+    return writeNumber(value);
 }
 
 OxBool OxOutput::write(int value) {
-    unsigned char bytes[4];
-    store(bytes, OxByteOrder::swap32(bitCast<std::uint32_t>(value)));
-    return writeValueBytes(bytes, 4);
+    return writeNumber(value);
 }
 
 OxBool OxOutput::write(unsigned int value) {
-    unsigned char bytes[4];
-    store(bytes, OxByteOrder::swap32(value));
-    return writeValueBytes(bytes, 4);
+    return writeNumber(value);
 }
 
 OxBool OxOutput::write(float value) {
-    unsigned char bytes[4];
-    store(bytes, swapf(value));
-    return writeValueBytes(bytes, 4);
+    return writeNumber(value);
 }
 
 OxBool OxOutput::write(double value) {
-    unsigned char bytes[8];
-    store(bytes, swapd(value));
-    return writeValueBytes(bytes, 8);
+    return writeNumber(value);
 }
 
 OxBool OxOutput::writeBlock(const char* buffer, long long length) {

@@ -64,6 +64,8 @@ protected:
 
 private:
     OxBool writeValueBytes(const unsigned char* bytes, unsigned int size);
+    /// One value of type T in big-endian order, with the state rule of write.
+    template <class T> OxBool writeNumber(T value);
     OxBool writeBlock(const char* buffer, long long length);
 
     std::ofstream* stream;
