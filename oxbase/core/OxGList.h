@@ -33,6 +33,15 @@ public:
     /// An empty list with capacity 4.
     OxGList() { reserve(4); }
 
+    /// An empty list with `initialCapacity` slots as reserve rounds them (0:
+    /// no storage until the first append). For owners that know their lists
+    /// stay short, such as the attribute lists of document elements.
+    explicit OxGList(unsigned int initialCapacity) {
+        if (initialCapacity > 0) {
+            reserve(initialCapacity);
+        }
+    }
+
     /// A copy with the same elements (the same pointees for pointer elements).
     OxGList(const OxGList<T>& other) {
         reserve(other.capacity);

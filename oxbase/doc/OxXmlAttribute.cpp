@@ -1,7 +1,9 @@
 #include "oxbase/doc/OxXmlAttribute.h"
 
+#include "oxbase/core/OxSlabPool.h"
 #include "oxbase/core/OxString.h"
 #include "oxbase/diag/OxPrt.h"
+#include "oxbase/doc/OxXmlNames.h"
 #include "oxbase/geom/OxColor.h"
 #include "oxbase/geom/OxRot.h"
 #include "oxbase/geom/OxVec.h"
@@ -22,20 +24,23 @@ void setNineDigits(std::ostrstream* stream) {
     stream->precision(9);
 }
 
+/// The blocks of every OxXmlAttribute.
+OxSlabPool attributePool(sizeof(OxXmlAttribute));
+
 /// Values per line of the list form.
 constexpr unsigned int kListLineValues = 11;
 } // namespace
 
-OxXmlAttribute::OxXmlAttribute(char const* name) : name(trimmedCopy(name)) {}
+OxXmlAttribute::OxXmlAttribute(char const* name) : name(OxXmlNames::acquire(name)) {}
 
 OxXmlAttribute::OxXmlAttribute(char const* name, char const* value)
-    : name(trimmedCopy(name)), value(trimmedCopy(value)) {}
+    : name(OxXmlNames::acquire(name)), value(trimmedCopy(value)) {}
 
 OxXmlAttribute::OxXmlAttribute(char const* name, OxString const* value)
-    : name(trimmedCopy(name)), value(trimmedCopy(value != nullptr ? value->getString() : nullptr)) {
-}
+    : name(OxXmlNames::acquire(name)),
+      value(trimmedCopy(value != nullptr ? value->getString() : nullptr)) {}
 
-OxXmlAttribute::OxXmlAttribute(char const* name, char value) : name(trimmedCopy(name)) {
+OxXmlAttribute::OxXmlAttribute(char const* name, char value) : name(OxXmlNames::acquire(name)) {
     char text[2] = {value, '\0'};
     this->value = trimmedCopy(text);
 }
@@ -43,27 +48,28 @@ OxXmlAttribute::OxXmlAttribute(char const* name, char value) : name(trimmedCopy(
 OxXmlAttribute::OxXmlAttribute(char const* name, unsigned char value)
     : OxXmlAttribute(name, static_cast<char>(value)) {}
 
-OxXmlAttribute::OxXmlAttribute(char const* name, int value) : name(trimmedCopy(name)) {
+OxXmlAttribute::OxXmlAttribute(char const* name, int value) : name(OxXmlNames::acquire(name)) {
     std::ostrstream* stream = conversionPrt.getStr();
     stream->unsetf(std::ios::basefield);
     *stream << std::dec << value;
     storeFormatted();
 }
 
-OxXmlAttribute::OxXmlAttribute(char const* name, unsigned int value) : name(trimmedCopy(name)) {
+OxXmlAttribute::OxXmlAttribute(char const* name, unsigned int value)
+    : name(OxXmlNames::acquire(name)) {
     std::ostrstream* stream = conversionPrt.getStr();
     *stream << std::dec << value;
     storeFormatted();
 }
 
-OxXmlAttribute::OxXmlAttribute(char const* name, float value) : name(trimmedCopy(name)) {
+OxXmlAttribute::OxXmlAttribute(char const* name, float value) : name(OxXmlNames::acquire(name)) {
     std::ostrstream* stream = conversionPrt.getStr();
     setNineDigits(stream);
     *stream << value;
     storeFormatted();
 }
 
-OxXmlAttribute::OxXmlAttribute(char const* name, double value) : name(trimmedCopy(name)) {
+OxXmlAttribute::OxXmlAttribute(char const* name, double value) : name(OxXmlNames::acquire(name)) {
     std::ostrstream* stream = conversionPrt.getStr();
     setNineDigits(stream);
     *stream << value;
@@ -72,7 +78,7 @@ OxXmlAttribute::OxXmlAttribute(char const* name, double value) : name(trimmedCop
 }
 
 OxXmlAttribute::OxXmlAttribute(char const* name, OxGList<unsigned int> const& values)
-    : name(trimmedCopy(name)) {
+    : name(OxXmlNames::acquire(name)) {
     storeList(values.getLength(), [&values](unsigned int i) {
         // The decimal digits, in a new array like the texts of toString.
         char digits[16];
@@ -83,32 +89,34 @@ OxXmlAttribute::OxXmlAttribute(char const* name, OxGList<unsigned int> const& va
 }
 
 OxXmlAttribute::OxXmlAttribute(char const* name, OxGList<double> const& values)
-    : name(trimmedCopy(name)) {
+    : name(OxXmlNames::acquire(name)) {
     storeList(values.getLength(), [&values](unsigned int i) { return toString(values[i]); });
 }
 
 OxXmlAttribute::OxXmlAttribute(char const* name, unsigned int count, double* values)
-    : name(trimmedCopy(name)) {
+    : name(OxXmlNames::acquire(name)) {
     if (values != nullptr) {
         storeList(count, [values](unsigned int i) { return toString(values[i]); });
     }
 }
 
 OxXmlAttribute::OxXmlAttribute(char const* name, unsigned int count, int* values)
-    : name(trimmedCopy(name)) {
+    : name(OxXmlNames::acquire(name)) {
     if (values != nullptr) {
         storeList(count,
                   [values](unsigned int i) { return toString(static_cast<double>(values[i])); });
     }
 }
 
-OxXmlAttribute::OxXmlAttribute(char const* name, OxColor const& color) : name(trimmedCopy(name)) {
+OxXmlAttribute::OxXmlAttribute(char const* name, OxColor const& color)
+    : name(OxXmlNames::acquire(name)) {
     double channels[3] = {0.0, 0.0, 0.0};
     color.getColor(channels[0], channels[1], channels[2]);
     storeJoined(3, channels);
 }
 
-OxXmlAttribute::OxXmlAttribute(char const* name, OxRot const& rotation) : name(trimmedCopy(name)) {
+OxXmlAttribute::OxXmlAttribute(char const* name, OxRot const& rotation)
+    : name(OxXmlNames::acquire(name)) {
     double const(&m)[3][3] = rotation.getValue();
     double elements[9];
     for (unsigned int i = 0; i < 9; i++) {
@@ -117,23 +125,53 @@ OxXmlAttribute::OxXmlAttribute(char const* name, OxRot const& rotation) : name(t
     storeJoined(9, elements);
 }
 
-OxXmlAttribute::OxXmlAttribute(char const* name, OxVec2d const& vector) : name(trimmedCopy(name)) {
+OxXmlAttribute::OxXmlAttribute(char const* name, OxVec2d const& vector)
+    : name(OxXmlNames::acquire(name)) {
     double coordinates[2] = {vector[0], vector[1]};
     storeJoined(2, coordinates);
 }
 
-OxXmlAttribute::OxXmlAttribute(char const* name, OxVec3d const& vector) : name(trimmedCopy(name)) {
+OxXmlAttribute::OxXmlAttribute(char const* name, OxVec3d const& vector)
+    : name(OxXmlNames::acquire(name)) {
     double coordinates[3] = {vector[0], vector[1], vector[2]};
     storeJoined(3, coordinates);
 }
 
-OxXmlAttribute::OxXmlAttribute(char const* name, OxVec4d const& vector) : name(trimmedCopy(name)) {
+OxXmlAttribute::OxXmlAttribute(char const* name, OxVec4d const& vector)
+    : name(OxXmlNames::acquire(name)) {
     double coordinates[4] = {vector[0], vector[1], vector[2], vector[3]};
     storeJoined(4, coordinates);
 }
 
+void* OxXmlAttribute::operator new(std::size_t size) {
+    void* memory = size == sizeof(OxXmlAttribute) ? attributePool.allocate() : ::operator new(size);
+    if (memory == nullptr) {
+        throw std::bad_alloc();
+    }
+    return memory;
+}
+
+void* OxXmlAttribute::operator new(std::size_t size, std::nothrow_t const&) noexcept {
+    return size == sizeof(OxXmlAttribute) ? attributePool.allocate()
+                                          : ::operator new(size, std::nothrow);
+}
+
+void OxXmlAttribute::operator delete(void* memory, std::size_t size) {
+    if (size == sizeof(OxXmlAttribute)) {
+        attributePool.release(memory);
+    } else {
+        ::operator delete(memory);
+    }
+}
+
+void OxXmlAttribute::operator delete(void* memory, std::nothrow_t const&) noexcept {
+    // Only reached when a constructor fails after `new (std::nothrow)`, and
+    // only for the class itself.
+    attributePool.release(memory);
+}
+
 OxXmlAttribute::~OxXmlAttribute() {
-    delete[] name;
+    OxXmlNames::release(name);
     delete[] value;
 }
 

@@ -14,7 +14,9 @@
 #include "oxbase/core/OxGList.h"
 #include "oxbase/core/OxTypes.h"
 
+#include <cstddef>
 #include <cstdint>
+#include <new>
 
 class OxString;
 class OxPrt;
@@ -70,6 +72,13 @@ public:
     OxXmlAttribute& operator=(const OxXmlAttribute&) = delete;
     virtual ~OxXmlAttribute();
 
+    /// Attributes come from a pool of their own, as elements do (see
+    /// OxXmlElement); a derived class of another size uses the general heap.
+    static void* operator new(std::size_t size);
+    static void* operator new(std::size_t size, std::nothrow_t const&) noexcept;
+    static void operator delete(void* memory, std::size_t size);
+    static void operator delete(void* memory, std::nothrow_t const&) noexcept;
+
     /// The stored texts; null when absent.
     char const* getName() const { return name; }
     char const* getValue() const { return value; }
@@ -107,7 +116,7 @@ private:
     /// Stores the texts of `count` numbers joined by one blank.
     void storeJoined(unsigned int count, const double* numbers);
 
-    char* name = nullptr;
+    char const* name = nullptr; ///< shared with equal names (OxXmlNames)
     char* value = nullptr;
     OX_XML_ATTRIBUTE_DATA_TYPE type = OX_XML_ATTRIBUTE_TEXT;
 };

@@ -1,14 +1,17 @@
 #include "oxbase/doc/OxXmlElement.h"
 
+#include "oxbase/core/OxSlabPool.h"
 #include "oxbase/core/OxString.h"
 #include "oxbase/core/OxSystem.h"
 #include "oxbase/diag/OxPrt.h"
 #include "oxbase/doc/OxXmlFile.h"
+#include "oxbase/doc/OxXmlNames.h"
 #include "oxbase/geom/OxColor.h"
 #include "oxbase/geom/OxVec.h"
 
 #include <cstdlib>
 #include <cstring>
+#include <new>
 #include <typeinfo>
 
 namespace {
@@ -21,26 +24,79 @@ bool sameText(char const* a, char const* b) {
     return a != nullptr && b != nullptr && std::strcmp(a, b) == 0;
 }
 
+/// The blocks of every OxXmlElement.
+OxSlabPool elementPool(sizeof(OxXmlElement));
+
+/// The blocks of the attribute and child lists of every element (lists of
+/// pointers, which all have one size).
+static_assert(sizeof(OxGList<OxXmlAttribute*>) == sizeof(OxGList<OxXmlElement*>),
+              "one pool serves both kinds of list");
+OxSlabPool listPool(sizeof(OxGList<OxXmlElement*>));
+
+/// A list of `capacity` slots in a block of listPool.
+template <class T> OxGList<T>* newList(unsigned int capacity) {
+    void* memory = listPool.allocate();
+    if (memory == nullptr) {
+        throw std::bad_alloc();
+    }
+    return new (memory) OxGList<T>(capacity);
+}
+
+/// Destroys a list made by newList (null is ignored).
+template <class T> void deleteList(OxGList<T>* list) {
+    if (list != nullptr) {
+        list->~OxGList<T>();
+        listPool.release(list);
+    }
+}
+
 /// The delimiters of the number lists: blank and tab, not the line end.
 char const* const kNumberDelimiters = " \t";
 
 } // namespace
 
 OxXmlElement::OxXmlElement(char const* elementName)
-    : type(XML_TYPE_ELEMENT), name(trimmedCopy(elementName)) {}
+    : type(XML_TYPE_ELEMENT), name(OxXmlNames::acquire(elementName)) {}
 
 OxXmlElement::OxXmlElement(XML_ELEMENT_TYPE elementType, char const* elementName)
-    : type(elementType), name(trimmedCopy(elementName)) {}
+    : type(elementType), name(OxXmlNames::acquire(elementName)) {}
+
+void* OxXmlElement::operator new(std::size_t size) {
+    void* memory = size == sizeof(OxXmlElement) ? elementPool.allocate() : ::operator new(size);
+    if (memory == nullptr) {
+        throw std::bad_alloc();
+    }
+    return memory;
+}
+
+void* OxXmlElement::operator new(std::size_t size, std::nothrow_t const&) noexcept {
+    return size == sizeof(OxXmlElement) ? elementPool.allocate()
+                                        : ::operator new(size, std::nothrow);
+}
+
+void OxXmlElement::operator delete(void* memory, std::size_t size) {
+    if (size == sizeof(OxXmlElement)) {
+        elementPool.release(memory);
+    } else {
+        ::operator delete(memory);
+    }
+}
+
+void OxXmlElement::operator delete(void* memory, std::nothrow_t const&) noexcept {
+    // Only reached when a constructor fails after `new (std::nothrow)`, and
+    // only for the class itself.
+    elementPool.release(memory);
+}
 
 OxXmlElement::~OxXmlElement() {
     delete[] xsiType;
-    delete[] name;
+    OxXmlNames::release(name);
     delete[] value;
     if (attributes != nullptr) {
         for (unsigned int i = 0; i < attributes->length; i++) {
             delete attributes->data[i];
         }
-        delete attributes;
+        deleteList(attributes);
     }
     if (children == nullptr) {
         return;
@@ -57,7 +113,7 @@ OxXmlElement::~OxXmlElement() {
                 pending = child;
             }
         }
-        delete list;
+        deleteList(list);
         list = nullptr;
     };
     takeChildren(children);
@@ -73,14 +129,15 @@ OxXmlElement::~OxXmlElement() {
 
 void OxXmlElement::addAttribute(OxXmlAttribute* attribute) {
     if (attributes == nullptr) {
-        attributes = new OxGList<OxXmlAttribute*>;
+        // Most elements carry one or two attributes: start with one slot.
+        attributes = newList<OxXmlAttribute*>(1);
     }
     attributes->append(attribute);
 }
 
 void OxXmlElement::addChild(OxXmlElement* child) {
     if (children == nullptr) {
-        children = new OxGList<OxXmlElement*>;
+        children = newList<OxXmlElement*>(4);
     }
     children->append(child);
 }
@@ -191,9 +248,9 @@ OxBool OxXmlElement::isYes(char const* attributeName) const {
 }
 
 void OxXmlElement::setName(char const* newName) {
-    delete[] name;
-    name = nullptr;
-    name = trimmedCopy(newName);
+    char const* old = name;
+    name = OxXmlNames::acquire(newName);
+    OxXmlNames::release(old);
 }
 
 void OxXmlElement::setValue(char const* newValue) {

@@ -4,6 +4,9 @@
 // without a name holds a declaration, comment, CDATA section or DOCTYPE as raw
 // text in its value. An element owns its strings, attributes and children;
 // trees of any depth are destroyed, dumped and written without recursion.
+// Names are shared between elements and attributes of equal name, and the
+// elements themselves come from a pool, so that a large document costs
+// little more than its text.
 //
 //   OxXmlElement * part = new OxXmlElement("part");
 //   part->addAttribute(new OxXmlAttribute("vec3d", OxVec3d(1, 2, 3)));
@@ -15,7 +18,9 @@
 #include "oxbase/core/OxTypes.h"
 #include "oxbase/doc/OxXmlAttribute.h"
 
+#include <cstddef>
 #include <cstdint>
+#include <new>
 
 class OxXmlFile;
 
@@ -38,6 +43,14 @@ public:
     /// Frees the strings and deletes every attribute and the whole subtree
     /// (without recursion, so any depth is safe). Does not touch `parent`.
     virtual ~OxXmlElement();
+
+    /// Elements come from a pool of their own (a read document holds many):
+    /// a block costs the object's size and no heap header. Objects of a
+    /// derived class of another size use the general heap.
+    static void* operator new(std::size_t size);
+    static void* operator new(std::size_t size, std::nothrow_t const&) noexcept;
+    static void operator delete(void* memory, std::size_t size);
+    static void operator delete(void* memory, std::nothrow_t const&) noexcept;
 
     // ---- Tree ----
 
@@ -127,7 +140,7 @@ private:
 
     XML_ELEMENT_TYPE type;
     char* xsiType = nullptr;
-    char* name = nullptr;
+    char const* name = nullptr; ///< shared with equal names (OxXmlNames)
     char* value = nullptr;
     OxXmlElement* parent = nullptr;
     OxGList<OxXmlElement*>* children = nullptr;

@@ -44,6 +44,14 @@ TEST(OxGList, GrowthFollowsPowersOfTwo) {
     reserved.makeEmpty();
     reserved.reserve(1);
     EXPECT_EQ(reserved.capacity, 1u);
+
+    OxGList<unsigned int> sized(3);
+    EXPECT_EQ(sized.capacity, 4u);
+    OxGList<unsigned int> bare(0);
+    EXPECT_EQ(bare.data, nullptr);
+    bare.append(5);
+    EXPECT_EQ(bare.capacity, 1u);
+    EXPECT_EQ(bare[0], 5u);
 }
 
 TEST(OxGList, RangeReportOnlyBeyondLength) {
