@@ -7,7 +7,6 @@
 
 #include <cctype>
 #include <cstring>
-#include <iomanip>
 #include <iostream>
 #include <new>
 
@@ -76,17 +75,12 @@ char const* nameOrEmpty(char const* text) {
     return text != nullptr ? text : "";
 }
 
-/// The print object in which the writer builds its lines.
+/// The writer's print object. Lines are built in a LineBuffer (below); the
+/// object is still made at the first write, as it always was, because
+/// building an OxPrt resets the dump indentation of the process.
 OxPrt& linePrt() {
     static OxPrt prt;
     return prt;
-}
-
-/// Takes the line out of the writer's print object and writes it.
-void putLine(OxOutput& output) {
-    char* line = linePrt().flushToString();
-    output.putline(line != nullptr ? line : "");
-    delete[] line;
 }
 
 /// A growable text: appending is amortised constant per character, so
@@ -166,6 +160,60 @@ private:
     size_t length = 0;
     size_t capacity = 0;
     size_t ceiling = 0;
+};
+
+/// One line of the writer, built in a buffer that every line reuses and
+/// handed to OxOutput::putline from there: a line costs no allocation and
+/// no copy but the output's own, where building it in a print stream and
+/// taking it out with flushToString cost a stream reset, a new array and a
+/// copy per line. The text is the same as that of the print stream.
+class LineBuffer {
+public:
+    /// `text` right-aligned in a field of `width` characters.
+    LineBuffer& field(int width, char const* text) {
+        size_t count = std::strlen(text);
+        for (int i = static_cast<int>(count); i < width; i++) {
+            add(' ');
+        }
+        return add(text, count);
+    }
+    LineBuffer& add(char const* text) { return add(text, std::strlen(text)); }
+    LineBuffer& add(char c) { return add(&c, 1); }
+    /// ` name="value"` of an attribute with a value, as OxXmlAttribute::write
+    /// puts it; nothing for one without. False for an attribute without name.
+    bool addAttribute(OxXmlAttribute const& attribute) {
+        if (attribute.getName() == nullptr) {
+            return false;
+        }
+        if (attribute.getValue() != nullptr) {
+            add(' ').add(attribute.getName()).add('=').add('"').add(attribute.getValue()).add('"');
+        }
+        return true;
+    }
+    /// Hands the line to `output` and starts the next. False, with nothing
+    /// sent, when memory ran out while the line was built.
+    bool send(OxOutput& output) {
+        bool complete = !failed;
+        if (complete) {
+            output.putline(text.text());
+        }
+        discard();
+        return complete;
+    }
+    /// Drops the line in progress.
+    void discard() {
+        text.clear();
+        failed = false;
+    }
+
+private:
+    LineBuffer& add(char const* part, size_t count) {
+        failed = failed || !text.append(part, count);
+        return *this;
+    }
+
+    TextBuffer text;
+    bool failed = false;
 };
 } // namespace
 
@@ -934,12 +982,24 @@ OxBool OxXmlFile::writeFile() {
         }
     } else {
         // putline adds a second line end: an empty line follows.
-        std::ostrstream& line = *linePrt().getStr();
-        line << std::setw(curpos + 1) << OX_XML_DECLARATION_START << " " << OX_XML_FIELD_VERSION
-             << OX_XML_ASSIGNMENT << OX_XML_QUOTE << OX_XML_VERSION << OX_XML_QUOTE << " "
-             << OX_XML_FIELD_ENCODING << OX_XML_ASSIGNMENT << OX_XML_QUOTE << "UTF-8"
-             << OX_XML_QUOTE << OX_XML_DECLARATION_END << "\n";
-        putLine(*output);
+        linePrt();
+        LineBuffer line;
+        line.field(curpos + 1, OX_XML_DECLARATION_START)
+            .add(' ')
+            .add(OX_XML_FIELD_VERSION)
+            .add(OX_XML_ASSIGNMENT)
+            .add(OX_XML_QUOTE)
+            .add(OX_XML_VERSION)
+            .add(OX_XML_QUOTE)
+            .add(' ')
+            .add(OX_XML_FIELD_ENCODING)
+            .add(OX_XML_ASSIGNMENT)
+            .add(OX_XML_QUOTE)
+            .add("UTF-8")
+            .add(OX_XML_QUOTE)
+            .add(OX_XML_DECLARATION_END)
+            .add('\n')
+            .send(*output);
     }
     for (unsigned int i = 0; i < preRootNodes.length; i++) {
         writeTopLevelNode(preRootNodes.data[i]);
@@ -973,8 +1033,9 @@ OxBool OxXmlFile::write(OxXmlElement const* element) {
         OxXmlElement const* element;
         unsigned int next;
     };
+    linePrt();
     OxGList<Frame> stack;
-    std::ostrstream* line = linePrt().getStr();
+    LineBuffer line;
     enum Visit { Done, Opened, Failed };
     auto visit = [this, &stack, &line](OxXmlElement const* node) -> Visit {
         if (node == nullptr) {
@@ -987,28 +1048,31 @@ OxBool OxXmlFile::write(OxXmlElement const* element) {
             output->putline(node->getValue()); // raw nodes stand at the margin
             return Done;
         }
-        line = linePrt().getStr();
-        *line << std::setw(curpos + 1) << OX_XML_START << node->getName();
+        line.field(curpos + 1, OX_XML_START).add(node->getName());
         if (node->getValue() != nullptr) {
-            *line << OX_XML_END << node->getValue() << OX_XML_START << OX_XML_NODE_END
-                  << node->getName() << OX_XML_END;
-            putLine(*output);
-            return Done;
+            line.add(OX_XML_END)
+                .add(node->getValue())
+                .add(OX_XML_START)
+                .add(OX_XML_NODE_END)
+                .add(node->getName())
+                .add(OX_XML_END);
+            return line.send(*output) ? Done : Failed;
         }
         for (unsigned int i = 0; i < node->getNbAttributes(); i++) {
             OxXmlAttribute const* attribute = node->getAttribute(i);
-            if (attribute != nullptr && !attribute->write(line)) {
-                delete[] linePrt().flushToString(); // the line in progress is not sent
+            if (attribute != nullptr && !line.addAttribute(*attribute)) {
+                line.discard(); // the line in progress is not sent
                 return Failed;
             }
         }
         if (node->getNbChildElements() == 0) {
-            *line << OX_XML_NODE_END << OX_XML_END;
-            putLine(*output);
-            return Done;
+            line.add(OX_XML_NODE_END).add(OX_XML_END);
+            return line.send(*output) ? Done : Failed;
         }
-        *line << OX_XML_END;
-        putLine(*output);
+        line.add(OX_XML_END);
+        if (!line.send(*output)) {
+            return Failed;
+        }
         adjustIndent(1);
         stack.append(Frame{node, 0});
         return Opened;
@@ -1026,10 +1090,13 @@ OxBool OxXmlFile::write(OxXmlElement const* element) {
             continue;
         }
         adjustIndent(-1);
-        line = linePrt().getStr();
-        *line << std::setw(curpos + 1) << OX_XML_START << OX_XML_NODE_END << top.element->getName()
-              << OX_XML_END;
-        putLine(*output);
+        line.field(curpos + 1, OX_XML_START)
+            .add(OX_XML_NODE_END)
+            .add(top.element->getName())
+            .add(OX_XML_END);
+        if (!line.send(*output)) {
+            return OxFalse;
+        }
         stack.length--;
     }
     return OxTrue;

@@ -104,7 +104,8 @@ public:
     /// generated one followed by an empty line), the nodes before the root,
     /// the element tree one blank per level, the nodes behind the root; then
     /// logs 579. OxFalse with no good output or for a node that cannot be
-    /// written (no name and no value, an attribute without a name).
+    /// written (no name and no value, an attribute without a name) or a line
+    /// for which memory ran out (that line is not sent).
     OxBool writeFile();
 
     static short getIndent() { return curpos; }
