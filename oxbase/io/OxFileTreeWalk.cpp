@@ -272,7 +272,6 @@ int OxFileTreeWalk::walkDir(OxStat* status) {
 }
 
 int OxFileTreeWalk::process_entry(FileTreeWalkDir* dir, const char* name, std::size_t length) {
-    (void)dir;
     if (std::strcmp(name, ".") == 0 || std::strcmp(name, "..") == 0) {
         return 0;
     }
@@ -284,9 +283,14 @@ int OxFileTreeWalk::process_entry(FileTreeWalkDir* dir, const char* name, std::s
     std::memcpy(dirbuf + base, name, length);
     dirbuf[base + static_cast<std::int64_t>(length)] = '\0';
 
+    // An entry read from an open listing is looked up in its directory; one
+    // of a parked listing (stream closed, names kept) by its whole path.
     OxStat status;
     std::memset(&status, 0, sizeof status);
-    if (OxPlatformStat(dirbuf, &status) != 0) {
+    int found = dir->stream != nullptr
+                    ? OxPlatformFindStat(dir->stream->handle, dirbuf, name, &status)
+                    : OxPlatformStat(dirbuf, &status);
+    if (found != 0) {
         if (errno == EACCES || errno == ENOENT) {
             return 0; // gone or hidden since the listing: passed over
         }

@@ -11,6 +11,8 @@
 #include <io.h>
 #else
 #include <dirent.h>
+#include <fcntl.h>
+#include <sys/stat.h>
 #endif
 
 struct OxPlatformFindHandle {
@@ -65,6 +67,13 @@ int OxPlatformFindClose(OxPlatformFindHandle* handle) {
     int result = handle->handle != -1 ? _findclose(handle->handle) : 0;
     delete handle;
     return result;
+}
+
+int OxPlatformFindStat(OxPlatformFindHandle* handle, const char* path, const char* name,
+                       OxStat* status) {
+    (void)handle;
+    (void)name;
+    return OxPlatformStat(path, status);
 }
 
 #else
@@ -128,6 +137,14 @@ int OxPlatformFindClose(OxPlatformFindHandle* handle) {
     int result = handle->dir != nullptr ? ::closedir(handle->dir) : 0;
     delete handle;
     return result;
+}
+
+int OxPlatformFindStat(OxPlatformFindHandle* handle, const char* path, const char* name,
+                       OxStat* status) {
+    if (handle == nullptr || handle->dir == nullptr || name == nullptr || status == nullptr) {
+        return OxPlatformStat(path, status);
+    }
+    return ::fstatat(::dirfd(handle->dir), name, status, 0);
 }
 
 #endif

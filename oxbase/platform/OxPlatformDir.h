@@ -12,6 +12,8 @@
 #ifndef OXBASE_PLATFORM_OXPLATFORMDIR_H
 #define OXBASE_PLATFORM_OXPLATFORMDIR_H
 
+#include "oxbase/platform/OxPlatformFs.h"
+
 #include <cstddef>
 #include <string>
 
@@ -29,6 +31,14 @@ OxPlatformFindHandle* OxPlatformFindFirst(const char* pattern, const char** firs
 int OxPlatformFindNext(OxPlatformFindHandle* handle, const char** name);
 /// Releases the listing: 0, or -1 with errno set. A null handle gives -1.
 int OxPlatformFindClose(OxPlatformFindHandle* handle);
+/// The status of entry `name` of the listing's directory, whose full path is
+/// `path`, following links as OxPlatformStat does: 0, or -1 with errno set.
+/// On POSIX the entry is looked up in the open directory itself, so that
+/// the system does not resolve the whole path again for every entry (and a
+/// path beyond the system's length limit still works); elsewhere `path` is
+/// used.
+int OxPlatformFindStat(OxPlatformFindHandle* handle, const char* path, const char* name,
+                       OxStat* status);
 
 /// The length of the root of a path: 3 for "c:" on a platform with drives,
 /// else 1.
