@@ -45,6 +45,41 @@ void OxSlabPool::release(void* block) noexcept {
     }
 }
 
+void* OxSlabPool::allocateObject(std::size_t size) {
+    if (size != objectSize) {
+        return ::operator new(size);
+    }
+    void* block = allocate();
+    if (block == nullptr) {
+        throw std::bad_alloc();
+    }
+    return block;
+}
+
+void* OxSlabPool::allocateObject(std::size_t size, std::nothrow_t const&) noexcept {
+    return size == objectSize ? allocate() : ::operator new(size, std::nothrow);
+}
+
+void OxSlabPool::releaseObject(void* memory, std::size_t size) noexcept {
+    if (size == objectSize) {
+        release(memory);
+    } else {
+        ::operator delete(memory);
+    }
+}
+
+void OxSlabPool::releaseObject(void* memory) noexcept {
+    auto* address = static_cast<char*>(memory);
+    for (Slab* slab = slabs; slab != nullptr; slab = slab->next) {
+        auto* start = reinterpret_cast<char*>(slab);
+        if (address >= start && address < start + slab->bytes) {
+            release(memory);
+            return;
+        }
+    }
+    ::operator delete(memory);
+}
+
 bool OxSlabPool::grow() noexcept {
     std::size_t bytes = slabs == nullptr ? kFirstSlabBytes : slabs->bytes * 2;
     if (bytes > kLargestSlabBytes) {

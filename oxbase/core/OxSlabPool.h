@@ -12,6 +12,10 @@
 //   void* memory = pool.allocate();   // null when the heap is exhausted
 //   pool.release(memory);
 //
+// A class routes its own operator new and delete through allocateObject and
+// releaseObject, which send objects of any other size (a derived class) to
+// the general heap.
+//
 // The constructor is constexpr and the class has no destructor, so a static
 // pool is ready before any code runs and still usable while other statics
 // are destroyed; it holds no memory while no block is in use. No lock: one thread at a time, as
@@ -20,13 +24,15 @@
 #define OXBASE_CORE_OXSLABPOOL_H
 
 #include <cstddef>
+#include <new>
 
 class OxSlabPool {
 public:
     /// A pool of blocks of `blockSize` bytes (rounded up to a pointer's
     /// alignment). No memory is taken until the first allocate.
     constexpr explicit OxSlabPool(std::size_t blockSize)
-        : blockSize(blockSize < sizeof(void*)
+        : objectSize(blockSize),
+          blockSize(blockSize < sizeof(void*)
                         ? sizeof(void*)
                         : (blockSize + alignof(void*) - 1) / alignof(void*) * alignof(void*)) {}
     OxSlabPool(const OxSlabPool&) = delete;
@@ -41,6 +47,20 @@ public:
     void* allocate() noexcept;
     /// Returns a block of this pool (null is ignored).
     void release(void* block) noexcept;
+
+    /// For a class-specific operator new: a block when `size` is the size
+    /// the pool was made for, else memory of the general heap; on failure
+    /// std::bad_alloc as from a plain new.
+    void* allocateObject(std::size_t size);
+    /// The same, null on failure (for `new (std::nothrow)`).
+    void* allocateObject(std::size_t size, std::nothrow_t const&) noexcept;
+    /// For a class-specific sized operator delete: the counterpart of
+    /// allocateObject for an object of `size` bytes.
+    void releaseObject(void* memory, std::size_t size) noexcept;
+    /// For a placement operator delete, which is not told the size: the
+    /// pool tells its blocks by their address (a walk over the slabs, for
+    /// the rare constructor that fails).
+    void releaseObject(void* memory) noexcept;
 
 private:
     struct Slab {
@@ -57,6 +77,7 @@ private:
     /// Frees every slab (no block is in use).
     void shrink() noexcept;
 
+    std::size_t objectSize; ///< the size of the objects the pool was made for
     std::size_t blockSize;
     std::size_t live = 0;
     FreeBlock* freeBlocks = nullptr;

@@ -144,30 +144,19 @@ OxXmlAttribute::OxXmlAttribute(char const* name, OxVec4d const& vector)
 }
 
 void* OxXmlAttribute::operator new(std::size_t size) {
-    void* memory = size == sizeof(OxXmlAttribute) ? attributePool.allocate() : ::operator new(size);
-    if (memory == nullptr) {
-        throw std::bad_alloc();
-    }
-    return memory;
+    return attributePool.allocateObject(size);
 }
 
-void* OxXmlAttribute::operator new(std::size_t size, std::nothrow_t const&) noexcept {
-    return size == sizeof(OxXmlAttribute) ? attributePool.allocate()
-                                          : ::operator new(size, std::nothrow);
+void* OxXmlAttribute::operator new(std::size_t size, std::nothrow_t const& tag) noexcept {
+    return attributePool.allocateObject(size, tag);
 }
 
 void OxXmlAttribute::operator delete(void* memory, std::size_t size) {
-    if (size == sizeof(OxXmlAttribute)) {
-        attributePool.release(memory);
-    } else {
-        ::operator delete(memory);
-    }
+    attributePool.releaseObject(memory, size);
 }
 
 void OxXmlAttribute::operator delete(void* memory, std::nothrow_t const&) noexcept {
-    // Only reached when a constructor fails after `new (std::nothrow)`, and
-    // only for the class itself.
-    attributePool.release(memory);
+    attributePool.releaseObject(memory);
 }
 
 OxXmlAttribute::~OxXmlAttribute() {

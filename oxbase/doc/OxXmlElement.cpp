@@ -62,30 +62,19 @@ OxXmlElement::OxXmlElement(XML_ELEMENT_TYPE elementType, char const* elementName
     : type(elementType), name(OxXmlNames::acquire(elementName)) {}
 
 void* OxXmlElement::operator new(std::size_t size) {
-    void* memory = size == sizeof(OxXmlElement) ? elementPool.allocate() : ::operator new(size);
-    if (memory == nullptr) {
-        throw std::bad_alloc();
-    }
-    return memory;
+    return elementPool.allocateObject(size);
 }
 
-void* OxXmlElement::operator new(std::size_t size, std::nothrow_t const&) noexcept {
-    return size == sizeof(OxXmlElement) ? elementPool.allocate()
-                                        : ::operator new(size, std::nothrow);
+void* OxXmlElement::operator new(std::size_t size, std::nothrow_t const& tag) noexcept {
+    return elementPool.allocateObject(size, tag);
 }
 
 void OxXmlElement::operator delete(void* memory, std::size_t size) {
-    if (size == sizeof(OxXmlElement)) {
-        elementPool.release(memory);
-    } else {
-        ::operator delete(memory);
-    }
+    elementPool.releaseObject(memory, size);
 }
 
 void OxXmlElement::operator delete(void* memory, std::nothrow_t const&) noexcept {
-    // Only reached when a constructor fails after `new (std::nothrow)`, and
-    // only for the class itself.
-    elementPool.release(memory);
+    elementPool.releaseObject(memory);
 }
 
 OxXmlElement::~OxXmlElement() {

@@ -70,4 +70,12 @@ TEST(OxXmlNamesTest, RenamingOneNodeLeavesTheOthers) {
     auto* attribute = new OxXmlAttribute("point", 1);
     second.addAttribute(attribute);
     EXPECT_EQ(attribute->getName(), second.getName());
+
+    // A derived node of another size lives on the heap, child of a pooled one.
+    struct Tagged : OxXmlElement {
+        using OxXmlElement::OxXmlElement;
+        long tag = 7;
+    };
+    second.addChild(new Tagged("point"));
+    EXPECT_EQ(second.getChild(0)->getName(), second.getName());
 }
