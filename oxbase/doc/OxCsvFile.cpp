@@ -183,6 +183,19 @@ void OxCsvFile::takeRecord(char* line) {
     OxXmlElement* record = new OxXmlElement("record");
     root->addChild(record);
     record->setParent(root);
+    // One attribute per non-empty field: count them, so that the record's
+    // list is made once at its final size.
+    unsigned int fields = 0;
+    for (char const *p = line, *start = line;; p++) {
+        if (*p == separator || *p == '\0') {
+            fields += p != start ? 1 : 0;
+            if (*p == '\0') {
+                break;
+            }
+            start = p + 1;
+        }
+    }
+    record->reserveAttributes(fields);
     unsigned int position = 0;
     char* start = line;
     for (char* p = line;; p++) {

@@ -124,6 +124,14 @@ void OxXmlElement::addAttribute(OxXmlAttribute* attribute) {
     attributes->append(attribute);
 }
 
+void OxXmlElement::reserveAttributes(unsigned int count) {
+    if (attributes == nullptr) {
+        attributes = newList<OxXmlAttribute*>(count);
+    } else {
+        attributes->reserve(count);
+    }
+}
+
 void OxXmlElement::addChild(OxXmlElement* child) {
     if (children == nullptr) {
         children = newList<OxXmlElement*>(4);

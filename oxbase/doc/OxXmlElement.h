@@ -56,6 +56,10 @@ public:
 
     /// Appends `attribute` (null too); the element takes ownership.
     void addAttribute(OxXmlAttribute* attribute);
+    /// Makes room for `count` attributes in all, so that a caller that knows
+    /// how many it will add (a CSV record) does not grow the list step by
+    /// step. Changes nothing that can be read.
+    void reserveAttributes(unsigned int count);
     /// Appends `child` (null too); the element takes ownership. The child's
     /// parent is not set: that is setParent.
     void addChild(OxXmlElement* child);

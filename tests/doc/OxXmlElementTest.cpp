@@ -54,10 +54,14 @@ TEST(OxXmlElementTest, DeletingChildren) {
 
 TEST(OxXmlElementTest, LookupsByName) {
     auto parent = threeChildren();
+    parent->reserveAttributes(0); // room only: nothing to read yet
+    EXPECT_EQ(parent->getNbAttributes(), 0u);
+    EXPECT_EQ(parent->getAttribute(0), nullptr);
     parent->addChild(nullptr); // null slots are skipped everywhere
     parent->addAttribute(nullptr);
     parent->addAttribute(new OxXmlAttribute(static_cast<const char*>(nullptr), "x"));
     parent->addAttribute(new OxXmlAttribute("Flag", "yes"));
+    parent->reserveAttributes(9);
     parent->addAttribute(new OxXmlAttribute("flag", " yes "));
     parent->addAttribute(new OxXmlAttribute("flag", "no"));
     parent->addAttribute(new OxXmlAttribute("other", "Yes"));
