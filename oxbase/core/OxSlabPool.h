@@ -18,8 +18,8 @@
 //
 // The constructor is constexpr and the class has no destructor, so a static
 // pool is ready before any code runs and still usable while other statics
-// are destroyed; it holds no memory while no block is in use. No lock: one thread at a time, as
-// everywhere in the library.
+// are destroyed; it holds no memory while no block is in use. No lock: one
+// thread at a time, as everywhere in the library.
 #ifndef OXBASE_CORE_OXSLABPOOL_H
 #define OXBASE_CORE_OXSLABPOOL_H
 

@@ -107,7 +107,7 @@ void OxXmlNames::release(char const* name) {
         return;
     }
     // The header sits right before the text (see acquire).
-    auto* entry = reinterpret_cast<NameEntry*>(const_cast<char*>(name)) - 1;
+    auto* entry = reinterpret_cast<NameEntry*>(const_cast<char*>(name) - sizeof(NameEntry));
     if (--entry->users > 0) {
         return;
     }
