@@ -1,6 +1,7 @@
 // OxBase side of the CSV case: OxCsvFile::readFile of the table into the
 // element tree (one record element per data line).
 #include "OxBench.h"
+#include "OxBenchDocument.h"
 
 #include "oxbase/doc/OxCsvFile.h"
 #include "oxbase/doc/OxXmlElement.h"
@@ -18,16 +19,7 @@ public:
         path = corpus.csvTable;
         return true;
     }
-    Outcome run() override {
-        file = std::make_unique<OxCsvFile>(path.c_str(), OxFile::OxIOInput);
-        Outcome outcome;
-        outcome.ok = file->readFile() == OxTrue;
-        if (!outcome.ok) {
-            outcome.note = "readFile answered OxFalse";
-        }
-        outcome.amount = static_cast<double>(fileSize(path));
-        return outcome;
-    }
+    Outcome run() override { return readDocument(path, file); }
     void afterRun(Outcome& outcome) override {
         const OxXmlElement* root = file->getRoot();
         outcome.check = root != nullptr ? root->getNbChildElements() : 0;

@@ -2,6 +2,7 @@
 // comment document, and OxXmlFile::writeFile of the model as it was read.
 #include "OxBench.h"
 #include "OxBenchCorpus.h"
+#include "OxBenchDocument.h"
 
 #include "oxbase/doc/OxXmlElement.h"
 #include "oxbase/doc/OxXmlFile.h"
@@ -33,16 +34,7 @@ public:
         path = comment ? corpus.xmlComment : corpus.xmlModel;
         return true;
     }
-    Outcome run() override {
-        file = std::make_unique<OxXmlFile>(path.c_str(), OxFile::OxIOInput);
-        Outcome outcome;
-        outcome.ok = file->readFile() == OxTrue;
-        if (!outcome.ok) {
-            outcome.note = "readFile answered OxFalse";
-        }
-        outcome.amount = static_cast<double>(fileSize(path));
-        return outcome;
-    }
+    Outcome run() override { return readDocument(path, file); }
     void afterRun(Outcome& outcome) override {
         outcome.check = countElements(file->getRoot());
         file.reset();

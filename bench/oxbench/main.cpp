@@ -220,6 +220,53 @@ ChildReport childWork(const Entry& entry, const Corpus& corpus, int runs, bool m
     return report;
 }
 
+bool writeAll(int fd, const void* data, std::size_t size) {
+    const char* p = static_cast<const char*>(data);
+    while (size > 0) {
+        ssize_t n = write(fd, p, size);
+        if (n <= 0) {
+            return false;
+        }
+        p += n;
+        size -= static_cast<std::size_t>(n);
+    }
+    return true;
+}
+
+// Reads `size` bytes (a child's report); false on end of file, error or when
+// the deadline passes (then `timedOut` is set).
+bool readAll(int fd, void* buffer, std::size_t size, int timeoutSeconds, bool& timedOut) {
+    timedOut = false;
+    char* data = static_cast<char*>(buffer);
+    std::size_t got = 0;
+    auto deadline = std::chrono::steady_clock::now() + std::chrono::seconds(timeoutSeconds);
+    while (got < size) {
+        auto left = std::chrono::duration_cast<std::chrono::milliseconds>(
+                        deadline - std::chrono::steady_clock::now())
+                        .count();
+        if (left <= 0) {
+            timedOut = true;
+            return false;
+        }
+        struct pollfd p {
+            fd, POLLIN, 0
+        };
+        int ready = poll(&p, 1, static_cast<int>(std::min<long long>(left, 1000)));
+        if (ready < 0 && errno != EINTR) {
+            return false;
+        }
+        if (ready <= 0) {
+            continue;
+        }
+        ssize_t n = read(fd, data + got, size - got);
+        if (n <= 0) {
+            return false;
+        }
+        got += static_cast<std::size_t>(n);
+    }
+    return true;
+}
+
 RowResult runRow(const RowSpec& plan, const Corpus& corpus, const Options& options) {
     RowResult result;
     result.plan = &plan;
@@ -263,34 +310,8 @@ RowResult runRow(const RowSpec& plan, const Corpus& corpus, const Options& optio
     }
     close(fds[1]);
     ChildReport report;
-    char* data = reinterpret_cast<char*>(&report);
-    std::size_t got = 0;
-    auto deadline = std::chrono::steady_clock::now() + std::chrono::seconds(options.timeoutSeconds);
     bool timedOut = false;
-    while (got < sizeof(report)) {
-        auto left = std::chrono::duration_cast<std::chrono::milliseconds>(
-                        deadline - std::chrono::steady_clock::now())
-                        .count();
-        if (left <= 0) {
-            timedOut = true;
-            break;
-        }
-        struct pollfd p {
-            fds[0], POLLIN, 0
-        };
-        int ready = poll(&p, 1, static_cast<int>(std::min<long long>(left, 1000)));
-        if (ready < 0 && errno != EINTR) {
-            break;
-        }
-        if (ready <= 0) {
-            continue;
-        }
-        ssize_t n = read(fds[0], data + got, sizeof(report) - got);
-        if (n <= 0) {
-            break;
-        }
-        got += static_cast<std::size_t>(n);
-    }
+    bool complete = readAll(fds[0], &report, sizeof report, options.timeoutSeconds, timedOut);
     close(fds[0]);
     if (timedOut) {
         kill(pid, SIGKILL);
@@ -301,7 +322,7 @@ RowResult runRow(const RowSpec& plan, const Corpus& corpus, const Options& optio
         result.status = "timeout (> " + std::to_string(options.timeoutSeconds) + " s)";
         return result;
     }
-    if (got < sizeof(report)) {
+    if (!complete) {
         result.status = WIFSIGNALED(status)
                             ? "crashed (signal " + std::to_string(WTERMSIG(status)) + ")"
                             : "no report";
@@ -345,52 +366,6 @@ struct RunReport {
     int countsItems = 0;
     char note[512] = {};
 };
-
-bool writeAll(int fd, const void* data, std::size_t size) {
-    const char* p = static_cast<const char*>(data);
-    while (size > 0) {
-        ssize_t n = write(fd, p, size);
-        if (n <= 0) {
-            return false;
-        }
-        p += n;
-        size -= static_cast<std::size_t>(n);
-    }
-    return true;
-}
-
-// Reads one report; false on end of file, error or when the deadline passes.
-bool readReport(int fd, RunReport& report, int timeoutSeconds, bool& timedOut) {
-    timedOut = false;
-    char* data = reinterpret_cast<char*>(&report);
-    std::size_t got = 0;
-    auto deadline = std::chrono::steady_clock::now() + std::chrono::seconds(timeoutSeconds);
-    while (got < sizeof(report)) {
-        auto left = std::chrono::duration_cast<std::chrono::milliseconds>(
-                        deadline - std::chrono::steady_clock::now())
-                        .count();
-        if (left <= 0) {
-            timedOut = true;
-            return false;
-        }
-        struct pollfd p {
-            fd, POLLIN, 0
-        };
-        int ready = poll(&p, 1, static_cast<int>(std::min<long long>(left, 1000)));
-        if (ready < 0 && errno != EINTR) {
-            return false;
-        }
-        if (ready <= 0) {
-            continue;
-        }
-        ssize_t n = read(fd, data + got, sizeof(report) - got);
-        if (n <= 0) {
-            return false;
-        }
-        got += static_cast<std::size_t>(n);
-    }
-    return true;
-}
 
 // The child's side: prepare, report, then one run per 'r' until 'q'.
 [[noreturn]] void serveRuns(const Entry& entry, const Corpus& corpus, bool coldHeap, int cmdFd,
@@ -518,7 +493,7 @@ void runCaseInterleaved(std::vector<RowResult*>& results, const Corpus& corpus,
         w.reportFd = rep[0];
         RunReport ready;
         bool timedOut = false;
-        if (!readReport(w.reportFd, ready, options.timeoutSeconds, timedOut)) {
+        if (!readAll(w.reportFd, &ready, sizeof ready, options.timeoutSeconds, timedOut)) {
             stopWorker(w, failureStatus(timedOut, options.timeoutSeconds), timedOut);
         } else if (ready.state != 0) {
             r->note = ready.note;
@@ -538,7 +513,7 @@ void runCaseInterleaved(std::vector<RowResult*>& results, const Corpus& corpus,
             RunReport report;
             bool timedOut = false;
             if (!writeAll(w.cmdFd, "r", 1) ||
-                !readReport(w.reportFd, report, options.timeoutSeconds, timedOut)) {
+                !readAll(w.reportFd, &report, sizeof report, options.timeoutSeconds, timedOut)) {
                 stopWorker(w, failureStatus(timedOut, options.timeoutSeconds), timedOut);
                 continue;
             }
