@@ -24,6 +24,18 @@ size_t rootLength(const char* path, size_t length) {
     return 1;
 }
 
+// The position of the separator before `cursor`, or 0 when there is none
+// (index 0 is never tested: a leading separator belongs to the root).
+size_t previousSeparator(const char* path, size_t cursor) {
+    while (cursor > 0) {
+        cursor--;
+        if (cursor > 0 && path[cursor] == kSeparator) {
+            break;
+        }
+    }
+    return cursor;
+}
+
 bool isRooted(const char* path, size_t length) {
     size_t root = rootLength(path, length);
     return length >= root && path[root - 1] == kSeparator;
@@ -172,13 +184,7 @@ char* OxFile::getBaseName(const char* path, unsigned int levels) {
     size_t root = rootLength(path, length);
     size_t cursor = length;
     for (unsigned int pass = 0; pass < levels; pass++) {
-        // Back to the previous separator; index 0 is never tested.
-        while (cursor > 0) {
-            cursor--;
-            if (cursor > 0 && path[cursor] == kSeparator) {
-                break;
-            }
-        }
+        cursor = previousSeparator(path, cursor);
         if (cursor == 0) {
             return nullptr;
         }
@@ -208,12 +214,7 @@ char* OxFile::getFileName(const char* path, unsigned int levels) {
     size_t root = rootLength(path, length);
     size_t cursor = length;
     for (unsigned int pass = 0; pass < levels; pass++) {
-        while (cursor > 0) {
-            cursor--;
-            if (cursor > 0 && path[cursor] == kSeparator) {
-                break;
-            }
-        }
+        cursor = previousSeparator(path, cursor);
         // Onto the first separator of the run.
         while (cursor > root && path[cursor - 1] == kSeparator) {
             cursor--;
