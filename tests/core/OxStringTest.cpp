@@ -45,7 +45,7 @@ TEST(OxString, BufferMovesBetweenInlineAndHeap) {
 
     OxString self("a text of more than sixteen characters");
     OxString& alias = self;
-    self = alias; // self-assignment keeps the text
+    self = alias;                // self-assignment keeps the text
     self = self.getString() + 2; // a piece of its own text
     EXPECT_STREQ(self.getString(), "text of more than sixteen characters");
 
@@ -156,36 +156,39 @@ TEST(OxString, StripTrailingZeros) {
 }
 
 TEST(OxString, Translate) {
-    char hello[] = "hello";
-    EXPECT_EQ(OxString::tr(hello, "lo", "01", OxFalse), 3u);
-    EXPECT_STREQ(hello, "he001");
-    char longer[] = "hello";
-    EXPECT_EQ(OxString::tr(longer, "loh", "01", OxFalse), 3u); // 'h' has no partner
-    EXPECT_STREQ(longer, "he001");
-    char empty[] = "";
-    EXPECT_EQ(OxString::tr(empty, "a", "b", OxFalse), 0u);
-    EXPECT_EQ(OxString::tr(nullptr, "a", "b", OxFalse), 0u);
-    EXPECT_EQ(OxString::tr(hello, nullptr, "b", OxFalse), 0u);
-    EXPECT_EQ(OxString::tr(hello, "", "b", OxFalse), 0u);
-
-    char blanks[] = "a b c";
-    EXPECT_EQ(OxString::tr(blanks, ' ', ',', OxFalse), 2u);
-    EXPECT_STREQ(blanks, "a,b,c");
-
     // Squeeze: the second of two blanks follows a translated blank, so it is
     // not translated; the characters behind it that are still blanks are
-    // copied down one place and the text keeps its length.
-    char two[] = "a  b";
-    EXPECT_EQ(OxString::tr(two, ' ', ',', OxTrue), 1u);
-    EXPECT_STREQ(two, "a, b");
-    char three[] = "a   b";
-    EXPECT_EQ(OxString::tr(three, ' ', ',', OxTrue), 1u);
-    EXPECT_STREQ(three, "a,  b");
-    char single[] = "a b c";
-    EXPECT_EQ(OxString::tr(single, ' ', ',', OxTrue), 2u);
-    EXPECT_STREQ(single, "a,b,c");
-    // A match at a later position of `from` clears the memory.
-    char later[] = "a-x";
-    EXPECT_EQ(OxString::tr(later, "-x", "+y", OxTrue), 2u);
-    EXPECT_STREQ(later, "a+y");
+    // copied down one place and the text keeps its length. A match at a later
+    // position of `from` clears the memory.
+    struct Case {
+        const char* text;
+        const char* from;
+        const char* to;
+        OxBool squeeze;
+        unsigned int count;
+        const char* result;
+    } cases[] = {
+        {"hello", "lo", "01", OxFalse, 3, "he001"},
+        {"hello", "loh", "01", OxFalse, 3, "he001"}, // 'h' has no partner
+        {"", "a", "b", OxFalse, 0, ""},
+        {"hello", "", "b", OxFalse, 0, "hello"},
+        {"a b c", " ", ",", OxFalse, 2, "a,b,c"},
+        {"a  b", " ", ",", OxTrue, 1, "a, b"},
+        {"a   b", " ", ",", OxTrue, 1, "a,  b"},
+        {"a b c", " ", ",", OxTrue, 2, "a,b,c"},
+        {"a-x", "-x", "+y", OxTrue, 2, "a+y"},
+    };
+    for (const Case& c : cases) {
+        std::string text = c.text;
+        EXPECT_EQ(OxString::tr(&text[0], c.from, c.to, c.squeeze), c.count) << c.text;
+        EXPECT_STREQ(text.c_str(), c.result) << c.text;
+        if (std::strlen(c.from) == 1) { // the one-character form agrees
+            std::string again = c.text;
+            EXPECT_EQ(OxString::tr(&again[0], c.from[0], c.to[0], c.squeeze), c.count);
+            EXPECT_EQ(again, text);
+        }
+    }
+    char hello[] = "hello";
+    EXPECT_EQ(OxString::tr(nullptr, "a", "b", OxFalse), 0u);
+    EXPECT_EQ(OxString::tr(hello, nullptr, "b", OxFalse), 0u);
 }
