@@ -55,6 +55,20 @@ std::uint64_t swap64(std::uint64_t v) {
     return (v << 32) | (v >> 32);
 }
 
+// Writes the values big-endian to `f` in blocks of `chunk`'s size.
+void writeSwapped(std::FILE* f, std::vector<std::uint64_t>& chunk) {
+    for (std::size_t i = 0; i < kValues; i += kChunkValues) {
+        std::size_t n = std::min(kChunkValues, kValues - i);
+        for (std::size_t k = 0; k < n; k++) {
+            double v = valueAt(i + k);
+            std::uint64_t bits;
+            std::memcpy(&bits, &v, 8);
+            chunk[k] = swap64(bits);
+        }
+        std::fwrite(chunk.data(), 8, n, f);
+    }
+}
+
 // Writes the file with fwrite when no benchmark has written it yet.
 void ensureFile() {
     if (std::filesystem::exists(benchFile().path) &&
@@ -66,16 +80,7 @@ void ensureFile() {
         return;
     }
     std::vector<std::uint64_t> chunk(kChunkValues);
-    for (std::size_t i = 0; i < kValues; i += kChunkValues) {
-        std::size_t n = std::min(kChunkValues, kValues - i);
-        for (std::size_t k = 0; k < n; k++) {
-            double v = valueAt(i + k);
-            std::uint64_t bits;
-            std::memcpy(&bits, &v, 8);
-            chunk[k] = swap64(bits);
-        }
-        std::fwrite(chunk.data(), 8, n, f);
-    }
+    writeSwapped(f, chunk);
     std::fclose(f);
 }
 
@@ -109,16 +114,7 @@ void BM_FwriteSwapDoubles(benchmark::State& state) {
             state.SkipWithError("cannot open the output file");
             return;
         }
-        for (std::size_t i = 0; i < kValues; i += kChunkValues) {
-            std::size_t n = std::min(kChunkValues, kValues - i);
-            for (std::size_t k = 0; k < n; k++) {
-                double v = valueAt(i + k);
-                std::uint64_t bits;
-                std::memcpy(&bits, &v, 8);
-                chunk[k] = swap64(bits);
-            }
-            std::fwrite(chunk.data(), 8, n, f);
-        }
+        writeSwapped(f, chunk);
         std::fclose(f);
     }
     report(state);
