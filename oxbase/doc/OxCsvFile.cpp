@@ -28,6 +28,26 @@ void generatedColumnName(char (&name)[24], unsigned int position) {
     std::snprintf(name, sizeof name, "column%u", position);
 }
 
+/// Calls `take(start, length, last)` for each field of `line`, the empty ones
+/// included, `last` being true for the field that ends the line. The end of
+/// the text is tested before the separator, so every separator value is safe,
+/// NUL included (the whole line is then one field). `take` may write a NUL
+/// over the separator that ends its field.
+template <class Take> void splitFields(char* line, char separator, Take take) {
+    char* start = line;
+    for (char* p = line;; p++) {
+        bool last = *p == '\0';
+        if (!last && *p != separator) {
+            continue;
+        }
+        take(start, static_cast<size_t>(p - start), last);
+        if (last) {
+            return;
+        }
+        start = p + 1;
+    }
+}
+
 char const* nameOf(OxFile const* file) {
     char const* name = file != nullptr ? file->getFilename() : nullptr;
     return name != nullptr ? name : "";
@@ -162,21 +182,17 @@ void OxCsvFile::takeLine(char* line, bool& headerDone) {
 }
 
 bool OxCsvFile::takeHeader(char* line) {
-    char* start = line;
-    for (char* p = line;; p++) {
-        if (*p == separator) {
-            columnNames.append(OxString::dup(start, static_cast<size_t>(p - start)));
-            start = p + 1;
-        } else if (*p == '\0') {
-            if (p == start) {
-                // The line ends in the separator: more columns follow on the
-                // next line that is not skipped.
-                return false;
-            }
-            columnNames.append(OxString::dup(start, static_cast<size_t>(p - start)));
-            return true;
+    bool complete = true;
+    splitFields(line, separator, [this, &complete](char* start, size_t length, bool last) {
+        if (last && length == 0) {
+            // The line ends in the separator: more columns follow on the
+            // next line that is not skipped.
+            complete = false;
+            return;
         }
-    }
+        columnNames.append(OxString::dup(start, length));
+    });
+    return complete;
 }
 
 void OxCsvFile::takeRecord(char* line) {
@@ -186,25 +202,13 @@ void OxCsvFile::takeRecord(char* line) {
     // One attribute per non-empty field: count them, so that the record's
     // list is made once at its final size.
     unsigned int fields = 0;
-    for (char const *p = line, *start = line;; p++) {
-        if (*p == separator || *p == '\0') {
-            fields += p != start ? 1 : 0;
-            if (*p == '\0') {
-                break;
-            }
-            start = p + 1;
-        }
-    }
+    splitFields(line, separator,
+                [&fields](char*, size_t length, bool) { fields += length != 0 ? 1 : 0; });
     record->reserveAttributes(fields);
     unsigned int position = 0;
-    char* start = line;
-    for (char* p = line;; p++) {
-        bool atEnd = *p == '\0';
-        if (!atEnd && *p != separator) {
-            continue;
-        }
-        if (p != start) {
-            *p = '\0';
+    splitFields(line, separator, [this, record, &position](char* start, size_t length, bool) {
+        if (length != 0) {
+            start[length] = '\0';
             char generated[24];
             char const* name;
             if (position < columnNames.getLength()) {
@@ -217,12 +221,8 @@ void OxCsvFile::takeRecord(char* line) {
             record->addAttribute(attribute);
             attribute->setValue(start);
         }
-        if (atEnd) {
-            return;
-        }
         position++;
-        start = p + 1;
-    }
+    });
 }
 
 // ---------------------------------------------------------------------------
@@ -290,8 +290,12 @@ OxBool OxCsvFile::writeFile() {
         }
         output->putline(text.c_str());
     }
+    // Every line went out through putline, whose results the format leaves
+    // unread; the stream stays failed after a failed line, so one flush at
+    // the end tells whether the whole table reached the file.
+    OxBool flushed = output->flush();
     OxMsg::LogForce(578, nameOf(output));
-    return OxTrue;
+    return flushed;
 }
 
 // ---------------------------------------------------------------------------
@@ -361,21 +365,12 @@ OxBool OxCsvFile::parseCSVString(char const* text, char separator, OxGList<char*
         return OxTrue; // an empty text has no fields
     }
     OxString::stripWhite(copy);
-    char* start = copy;
-    for (char* p = copy;; p++) {
-        bool atEnd = *p == '\0';
-        if (!atEnd && *p != separator) {
-            continue;
-        }
-        if (p != start) {
-            char* field = OxString::dup(start, static_cast<size_t>(p - start));
+    splitFields(copy, separator, [&fields](char* start, size_t length, bool) {
+        if (length != 0) {
+            char* field = OxString::dup(start, length);
             fields.append(OxString::stripWhite(field));
         }
-        if (atEnd) {
-            break;
-        }
-        start = p + 1;
-    }
+    });
     delete[] copy;
     return OxTrue;
 }

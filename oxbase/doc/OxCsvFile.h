@@ -22,7 +22,9 @@
 // Lines of any length are read, and so is a last line without a line end. A
 // field behind the last column name is named "column<N>", N being its
 // zero-based position in the line. Text is NUL-terminated throughout the
-// library, so a NUL byte ends the text of its line.
+// library, so a NUL byte ends the text of its line. Any separator value is
+// safe; the separator NUL makes each line one field, and a table written
+// with it keeps only the first field of each record, as a line is a text.
 #ifndef OXBASE_DOC_OXCSVFILE_H
 #define OXBASE_DOC_OXCSVFILE_H
 
@@ -78,8 +80,10 @@ public:
     /// out unchanged (see convertToCsv). A record with fewer fields than the
     /// width (the number of columns, or else the field count of the first
     /// record) is padded with separators at its end. Without a root only the
-    /// header is written. OxFalse with no output or one that is not good, and
-    /// message 3 when the rewind fails.
+    /// header is written. OxFalse with no output or one that is not good,
+    /// message 3 when the rewind fails, and OxFalse too when the output failed
+    /// on the way (message 179): the output is flushed at the end, so a table
+    /// that did not reach the file whole is never answered OxTrue.
     OxBool writeFile();
 
     /// The tree or null; the object keeps it.

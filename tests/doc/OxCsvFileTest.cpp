@@ -168,6 +168,22 @@ TEST_F(CsvTest, HostileInputIsReadWithoutLoss) {
     EXPECT_EQ(record(*csv, 3), "a=last|b=1");
     EXPECT_NE(oxtest::dumpText(*csv).find("  CSV Input File Name: " + dir.file("in.csv")),
               std::string::npos);
+
+    // Any separator is safe, NUL included: it never matches inside a text,
+    // so each line is one field.
+    ASSERT_EQ(read(csv, "a,b\n1,2\n", '\0'), OxTrue);
+    ASSERT_EQ(csv->getColumnNames().getLength(), 1u);
+    EXPECT_EQ(record(*csv, 0), "a,b=1,2");
+    OxGList<char*> fields;
+    EXPECT_EQ(OxCsvFile::parseCSVString("x;y", '\0', fields), OxTrue);
+    ASSERT_EQ(fields.getLength(), 1u);
+    EXPECT_STREQ(fields[0], "x;y");
+    delete[] fields[0];
+    for (int sep = -128; sep < 128; sep++) {
+        ASSERT_EQ(read(csv, "h1 h2,h3\n#\nv 1,v2\n", static_cast<char>(sep)), OxTrue);
+        // One record, or none where the header ends in the separator.
+        EXPECT_EQ(csv->getRoot()->getNbChildElements(), sep == '3' ? 0u : 1u) << sep;
+    }
 }
 
 } // namespace
