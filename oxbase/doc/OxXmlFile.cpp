@@ -1008,6 +1008,12 @@ OxBool OxXmlFile::writeFile() {
     for (unsigned int i = 0; i < postRootNodes.length; i++) {
         writeTopLevelNode(postRootNodes.data[i]);
     }
+    // A failed line does not stop the writer (putline reports it), but the
+    // stream stays failed, so the closing flush tells whether everything
+    // reached the file: a document that did not is never reported written.
+    if (output->flush() != OxTrue) {
+        result = OxFalse;
+    }
     OxMsg::Log(kMsgWritten, nameOrEmpty(output->getFilename()));
     return result;
 }

@@ -104,8 +104,11 @@ public:
     /// generated one followed by an empty line), the nodes before the root,
     /// the element tree one blank per level, the nodes behind the root; then
     /// logs 579. OxFalse with no good output or for a node that cannot be
-    /// written (no name and no value, an attribute without a name) or a line
-    /// for which memory ran out (that line is not sent).
+    /// written (no name and no value, an attribute without a name), a line
+    /// for which memory ran out (that line is not sent), or when the output
+    /// failed on the way (its own message 179 tells): the output is flushed
+    /// at the end, so a document that did not reach the file whole is never
+    /// answered OxTrue.
     OxBool writeFile();
 
     static short getIndent() { return curpos; }

@@ -9,13 +9,22 @@
 #include <cstring>
 #include <string>
 
-
 namespace {
 
 constexpr int kErrorNoEntry = 2; // ENOENT on every platform the library serves
 
 const char* nameText(const char* name) {
     return name != nullptr ? name : "";
+}
+
+/// Whether something at `path` is removed before the open: whatever exists
+/// there except a device, FIFO or socket, which is opened as it stands, so
+/// that writing to /dev/null or to a pipe never turns it into a regular file.
+/// A symbolic link is removed itself, never what it points to; a directory
+/// cannot be removed this way and gives 182.
+bool isReplaceable(const char* path) {
+    OxStat status;
+    return OxPlatformLinkStat(path, &status) == 0 && !OxPlatformIsSpecialMode(status);
 }
 
 } // namespace
@@ -41,7 +50,7 @@ OxOutput::OxOutput(const char* name, OxFile::FILE_MODE mode) : OxFile(name), str
         } else if (!OxPlatformIsDirectoryMode(status)) {
             OxMsg::Log(181, directory.c_str());
             return;
-        } else if (OxPlatformStat(text, &status) == 0 && OxPlatformRemove(text) != 0) {
+        } else if (isReplaceable(text) && OxPlatformRemove(text) != 0) {
             OxMsg::Log(182, text);
             return;
         }
@@ -56,21 +65,57 @@ OxOutput::OxOutput(const char* name, OxFile::FILE_MODE mode) : OxFile(name), str
 }
 
 OxOutput::~OxOutput() {
-    if (stream != nullptr) {
-        stream->close();
-        delete stream;
+    if (stream == nullptr) {
+        return;
     }
+    bool wasGood = stream->good();
+    stream->close();
+    if (wasGood && !stream->good()) {
+        OxMsg::Log(183, nameText(filename));
+    }
+    delete stream;
+}
+
+OxBool OxOutput::flush() {
+    if (!hasStream()) {
+        return OxFalse;
+    }
+    stream->flush();
+    return checkState();
+}
+
+OxBool OxOutput::close() {
+    if (!hasStream()) {
+        return OxFalse;
+    }
+    // ofstream::close flushes first and sets the failure flag when either
+    // the flush or the close of the file fails.
+    stream->close();
+    OxBool result = checkState();
+    delete stream;
+    stream = nullptr;
+    return result;
+}
+
+OxBool OxOutput::hasStream() const {
+    if (stream == nullptr) {
+        OxMsg::Log(179, nameText(filename));
+        return OxFalse;
+    }
+    return OxTrue;
+}
+
+OxBool OxOutput::checkState() const {
+    if (!stream->good()) {
+        OxMsg::Log(179, nameText(filename));
+        readState();
+        return OxFalse;
+    }
+    return OxTrue;
 }
 
 OxBool OxOutput::writeValueBytes(const unsigned char* bytes, unsigned int size) {
-    const char* text = nameText(filename);
-    if (stream == nullptr) {
-        OxMsg::Log(179, text);
-        return OxFalse;
-    }
-    if (!stream->good()) {
-        OxMsg::Log(179, text);
-        readState();
+    if (!hasStream() || !checkState()) {
         return OxFalse;
     }
     // What ostream::write does, without its sentry: the state is known to be
@@ -79,12 +124,7 @@ OxBool OxOutput::writeValueBytes(const unsigned char* bytes, unsigned int size) 
     if (stream->rdbuf()->sputn(reinterpret_cast<const char*>(bytes), count) != count) {
         stream->setstate(std::ios_base::badbit);
     }
-    if (!stream->good()) {
-        OxMsg::Log(179, text);
-        readState();
-        return OxFalse;
-    }
-    return OxTrue;
+    return checkState();
 }
 
 OxBool OxOutput::write(char value) {
@@ -127,20 +167,17 @@ OxBool OxOutput::write(double value) {
 }
 
 OxBool OxOutput::writeBlock(const char* buffer, long long length) {
-    const char* text = nameText(filename);
     // The stream takes the length as a signed 32-bit count.
     std::int32_t count = static_cast<std::int32_t>(static_cast<std::uint32_t>(length));
-    if (stream == nullptr || count < 0 || (buffer == nullptr && count != 0)) {
-        OxMsg::Log(179, text);
+    if (!hasStream()) {
+        return OxFalse;
+    }
+    if (count < 0 || (buffer == nullptr && count != 0)) {
+        OxMsg::Log(179, nameText(filename));
         return OxFalse;
     }
     stream->write(buffer, static_cast<std::streamsize>(count));
-    if (!stream->good()) {
-        OxMsg::Log(179, text);
-        readState();
-        return OxFalse;
-    }
-    return OxTrue;
+    return checkState();
 }
 
 OxBool OxOutput::write(char* buffer, long long length) {
@@ -163,19 +200,13 @@ OxBool OxOutput::putline(const char* text) {
     if (text == nullptr) {
         return OxTrue;
     }
-    if (stream == nullptr) {
-        OxMsg::Log(179, nameText(filename));
+    if (!hasStream()) {
         return OxFalse;
     }
     stream->write(text, static_cast<std::streamsize>(std::strlen(text)));
     stream->put('\n');
     stream->flush();
-    if (!stream->good()) {
-        OxMsg::Log(179, nameText(filename));
-        readState();
-        return OxFalse;
-    }
-    return OxTrue;
+    return checkState();
 }
 
 OxBool OxOutput::putline(const unsigned char* text) {

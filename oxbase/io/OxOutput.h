@@ -2,9 +2,13 @@
 //
 // OxOutput writes a file through a buffered output file stream, in the same
 // layout that OxInput reads. Opening prepares the place first: a missing
-// directory level of the name is created, an existing file is removed. Every
+// directory level of the name is created, and an existing file is removed
+// (a symbolic link itself, never its target), except a device, FIFO or
+// socket, which is opened as it is and keeps its kind. Every
 // failure is logged by number (1, 179, 180, 181, 182 and the state messages
 // 18, 19, 20) and told by the result; a stream that has failed stays failed.
+// Typed values are buffered: call flush() or close() to learn that they
+// reached the file (putline flushes each line by itself).
 //
 //   OxOutput out("out\\part.bin", OxFile::FILE_MODE_BINARY);
 //   if (out.isGood()) { out.write(1.5); out.write(42); }
@@ -25,6 +29,10 @@ public:
     /// truncation (binary mode for FILE_MODE_BINARY, text mode otherwise).
     /// isGood() tells whether it worked. `name` must not be null or empty.
     OxOutput(const char* name, OxFile::FILE_MODE mode);
+    /// Closes the file. When the stream was clean until then and the final
+    /// flush or close fails, message 183 (type E) names the file, so that the
+    /// loss shows in the log and the error code; a stream that failed before
+    /// was reported then and is closed quietly.
     ~OxOutput() override;
 
     /// One value in file order (big-endian). OxFalse and 179 when the state
@@ -48,6 +56,16 @@ public:
     OxBool putline(const char* text);
     OxBool putline(const unsigned char* text);
 
+    /// Hands what the stream buffers to the file. OxFalse, with 179 and the
+    /// state logged, when the stream is missing or not clean afterwards:
+    /// values that `write` took into the buffer did not all reach the file.
+    OxBool flush();
+    /// Flushes and closes the file; the object has no stream afterwards, so
+    /// later writes fail with 179. OxTrue only when every byte written
+    /// reached the file and the close succeeded; otherwise 179 and the state
+    /// are logged and the result is OxFalse (also for a second close).
+    OxBool close();
+
     /// Whether the stream exists and its state is clean.
     OxBool isGood() const;
     /// The write position.
@@ -63,6 +81,10 @@ protected:
     void readState() const;
 
 private:
+    /// OxTrue when there is a stream; else 179 is logged.
+    OxBool hasStream() const;
+    /// OxTrue when the state is clean; else 179 and the state are logged.
+    OxBool checkState() const;
     OxBool writeValueBytes(const unsigned char* bytes, unsigned int size);
     /// One value of type T in big-endian order, with the state rule of write.
     template <class T> OxBool writeNumber(T value);

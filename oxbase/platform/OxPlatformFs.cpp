@@ -26,6 +26,18 @@ int OxPlatformStat(const char* path, OxStat* status) {
 #endif
 }
 
+int OxPlatformLinkStat(const char* path, OxStat* status) {
+    if (path == nullptr || status == nullptr) {
+        errno = ENOENT;
+        return -1;
+    }
+#ifdef _WIN32
+    return _stat64i32(path, status);
+#else
+    return ::lstat(OxPlatformNativePath(path).c_str(), status);
+#endif
+}
+
 unsigned int OxPlatformStatMode(const OxStat& status) {
     return static_cast<unsigned int>(status.st_mode);
 }
@@ -44,6 +56,15 @@ bool OxPlatformIsDirectoryMode(const OxStat& status) {
 
 bool OxPlatformIsRegularMode(const OxStat& status) {
     return (OxPlatformStatMode(status) & OxStatTypeMask) == OxStatTypeRegular;
+}
+
+bool OxPlatformIsSpecialMode(const OxStat& status) {
+#ifdef _WIN32
+    return (status.st_mode & _S_IFMT) == _S_IFCHR;
+#else
+    return S_ISCHR(status.st_mode) || S_ISBLK(status.st_mode) || S_ISFIFO(status.st_mode) ||
+           S_ISSOCK(status.st_mode);
+#endif
 }
 
 int OxPlatformMkdir(const char* path) {
@@ -146,17 +167,19 @@ std::ifstream* OxPlatformOpenInput(const char* path, bool binary) {
     if (binary) {
         mode |= std::ios_base::binary;
     }
-#ifdef _WIN32
-    return new std::ifstream(path != nullptr ? path : "", mode, _SH_DENYNO);
-#else
-    // POSIX opens never lock other processes out. A directory opens on POSIX
-    // but never reads; it is refused here as the Windows runtime refuses it.
+    // What exists and is not a regular file is refused before the open: a
+    // FIFO would block it until a writer comes, and a directory opens on
+    // POSIX but never reads. A missing file is left to the open to fail.
     OxStat status;
-    if (OxPlatformStat(path, &status) == 0 && OxPlatformIsDirectoryMode(status)) {
+    if (OxPlatformStat(path, &status) == 0 && !OxPlatformIsRegularMode(status)) {
         std::ifstream* refused = new std::ifstream();
         refused->setstate(std::ios_base::failbit);
         return refused;
     }
+#ifdef _WIN32
+    return new std::ifstream(path != nullptr ? path : "", mode, _SH_DENYNO);
+#else
+    // POSIX opens never lock other processes out.
     return new std::ifstream(OxPlatformNativePath(path), mode);
 #endif
 }

@@ -36,6 +36,10 @@ constexpr unsigned int OxStatTypeRegular = 0x8000u;
 /// File status of `path`, following symbolic links. 0 on success, else -1
 /// with errno set (a null path fails with ENOENT).
 int OxPlatformStat(const char* path, OxStat* status);
+/// File status of `path` itself: a symbolic link is described, not followed
+/// (`lstat`). Windows has no such links in its runtime's status call, so
+/// there it is the same as OxPlatformStat.
+int OxPlatformLinkStat(const char* path, OxStat* status);
 /// The mode field of a status record.
 unsigned int OxPlatformStatMode(const OxStat& status);
 /// Device and inode numbers, widened to 64 bits.
@@ -44,6 +48,9 @@ std::uint64_t OxPlatformStatInode(const OxStat& status);
 /// Whether the type bits of the mode say directory / regular file.
 bool OxPlatformIsDirectoryMode(const OxStat& status);
 bool OxPlatformIsRegularMode(const OxStat& status);
+/// Whether the status record is a character or block device, a FIFO or a
+/// socket: none of them is a file that can be replaced by a new one.
+bool OxPlatformIsSpecialMode(const OxStat& status);
 
 /// Creates one directory level (mode 0777 less the umask on POSIX).
 int OxPlatformMkdir(const char* path);
@@ -71,7 +78,9 @@ void OxPlatformPerror(const char* prefix);
 /// A new input / output file stream on `path` that other processes may read
 /// and write meanwhile, in binary mode when `binary`, else text mode. The
 /// output stream truncates. Never null; the caller tests the stream's state
-/// and deletes it.
+/// and deletes it. Input is read from regular files only: a directory, a
+/// FIFO, a device or a socket gives a failed stream at once, since a FIFO
+/// without a writer would block the open forever and a device may never end.
 std::ifstream* OxPlatformOpenInput(const char* path, bool binary);
 std::ofstream* OxPlatformOpenOutput(const char* path, bool binary);
 

@@ -10,6 +10,11 @@
 #include <string>
 #include <sys/stat.h>
 
+#ifndef _WIN32
+#include <fcntl.h>
+#include <unistd.h>
+#endif
+
 using oxiotest::IoTest;
 using oxiotest::Numbers;
 
@@ -349,11 +354,7 @@ TEST_F(IoTest, OutputSeekAndFailedState) {
     if (!std::filesystem::exists("/dev/full")) {
         GTEST_SKIP() << "no /dev/full to fail writes";
     }
-    // Opened by a bare name, so that preparing the place removes nothing.
-    std::filesystem::path home = std::filesystem::current_path();
-    std::filesystem::current_path("/dev");
-    OxOutput full("full", kText);
-    std::filesystem::current_path(home);
+    OxOutput full("/dev/full", kText);
     ASSERT_EQ(full.isGood(), OxTrue);
     EXPECT_EQ(full.putline("lost"), OxFalse); // the flush fails
     EXPECT_EQ(taken(), (Numbers{"179", "20"}));
@@ -364,3 +365,78 @@ TEST_F(IoTest, OutputSeekAndFailedState) {
     EXPECT_EQ(taken(), (Numbers{"179", "19", "20"}));
     EXPECT_EQ(full.isGood(), OxFalse);
 }
+
+#ifndef _WIN32
+TEST_F(IoTest, OutputKeepsDevicesFifosAndLinkTargets) {
+    struct stat status {};
+    {
+        OxOutput null("/dev/null", kBinary); // a directory part: the old file would go
+        EXPECT_EQ(null.write(7), OxTrue);
+        EXPECT_EQ(null.close(), OxTrue);
+    }
+    ASSERT_EQ(stat("/dev/null", &status), 0);
+    EXPECT_TRUE(S_ISCHR(status.st_mode));
+
+    // A FIFO is written through, not replaced; a reader is there first, so
+    // that the open does not wait.
+    const std::string fifo = dir.file("pipe");
+    ASSERT_EQ(mkfifo(fifo.c_str(), 0600), 0);
+    int reader = open(fifo.c_str(), O_RDONLY | O_NONBLOCK);
+    ASSERT_GE(reader, 0);
+    {
+        OxOutput out(fifo.c_str(), kText);
+        EXPECT_EQ(out.putline("through"), OxTrue);
+    }
+    char got[16] = {0};
+    EXPECT_EQ(read(reader, got, sizeof got - 1), 8);
+    EXPECT_STREQ(got, "through\n");
+    close(reader);
+    ASSERT_EQ(lstat(fifo.c_str(), &status), 0);
+    EXPECT_TRUE(S_ISFIFO(status.st_mode));
+
+    // A symbolic link is replaced itself; what it pointed to stays.
+    oxtest::writeFile(dir.file("target.txt"), "keep");
+    std::filesystem::create_symlink(dir.file("target.txt"), dir.file("link.txt"));
+    {
+        OxOutput out(dir.file("link.txt").c_str(), kText);
+        EXPECT_EQ(out.putline("new"), OxTrue);
+    }
+    EXPECT_EQ(oxtest::readFile(dir.file("target.txt")), "keep");
+    EXPECT_FALSE(std::filesystem::is_symlink(dir.file("link.txt")));
+    EXPECT_EQ(oxtest::readFile(dir.file("link.txt")), "new\n");
+    EXPECT_EQ(taken(), Numbers{});
+}
+
+TEST_F(IoTest, BufferedValuesReachTheFileOrTheirLossIsReported) {
+    const std::string path = dir.file("values.bin");
+    {
+        OxOutput out(path.c_str(), kBinary);
+        EXPECT_EQ(out.write(1), OxTrue);
+        EXPECT_EQ(out.flush(), OxTrue);
+        EXPECT_EQ(oxtest::readFile(path), bytes({0, 0, 0, 1}));
+        EXPECT_EQ(out.write(static_cast<short>(2)), OxTrue);
+        EXPECT_EQ(out.close(), OxTrue);
+        EXPECT_EQ(out.isGood(), OxFalse);
+        EXPECT_EQ(out.write(3), OxFalse); // closed: nothing more goes out
+        EXPECT_EQ(out.close(), OxFalse);
+    }
+    EXPECT_EQ(oxtest::readFile(path), bytes({0, 0, 0, 1, 0, 2}));
+    EXPECT_EQ(taken(), (Numbers{"179", "179"}));
+
+    // Values wait in the buffer and report success; the flush tells.
+    {
+        OxOutput full("/dev/full", kBinary);
+        EXPECT_EQ(full.write(1.0), OxTrue);
+        EXPECT_EQ(full.flush(), OxFalse);
+        EXPECT_EQ(taken(), (Numbers{"179", "20"}));
+        EXPECT_EQ(full.close(), OxFalse);
+        EXPECT_EQ(taken(), (Numbers{"179", "19", "20"}));
+    }
+    EXPECT_EQ(taken(), Numbers{}); // closed already: the destructor is quiet
+    {
+        OxOutput full("/dev/full", kBinary);
+        EXPECT_EQ(full.write(2.0), OxTrue);
+    } // a clean stream whose final close fails names the file
+    EXPECT_EQ(log.take(), std::vector<std::string>{"m183 /dev/full"});
+}
+#endif
