@@ -16,7 +16,6 @@
 #include <map>
 #include <string>
 #include <sys/stat.h>
-#include <sys/wait.h>
 #include <unistd.h>
 #include <vector>
 
@@ -423,29 +422,12 @@ TEST(OxFileTreeWalkTest, BadInputNeverCrashes) {
         EXPECT_EQ(unreadableDirectoryFaults(r, locked), "");
     } else {
         closedir(probe);
-        int pipeEnds[2];
-        ASSERT_EQ(pipe(pipeEnds), 0);
-        pid_t child = fork();
-        ASSERT_GE(child, 0);
-        if (child == 0) {
-            close(pipeEnds[0]);
-            std::string faults = "cannot drop rights";
-            if (chdir(r.c_str()) == 0 && setgid(65534) == 0 && setuid(65534) == 0) {
-                faults = unreadableDirectoryFaults(r, locked);
-            }
-            ssize_t written = write(pipeEnds[1], faults.data(), faults.size());
-            _exit(written == static_cast<ssize_t>(faults.size()) ? 0 : 1);
-        }
-        close(pipeEnds[1]);
-        std::string faults;
-        char buffer[512];
-        for (ssize_t got; (got = read(pipeEnds[0], buffer, sizeof buffer)) > 0;) {
-            faults.append(buffer, static_cast<size_t>(got));
-        }
-        close(pipeEnds[0]);
-        int status = 0;
-        waitpid(child, &status, 0);
-        EXPECT_TRUE(WIFEXITED(status) && WEXITSTATUS(status) == 0);
+        std::string faults = oxtest::inChild(
+            [&] {
+                return chdir(r.c_str()) == 0 ? unreadableDirectoryFaults(r, locked)
+                                             : std::string("cannot enter the tree");
+            },
+            oxtest::ChildLimits{true, 0});
         EXPECT_EQ(faults, "");
     }
     chmod(locked.c_str(), 0700);

@@ -5,8 +5,16 @@
 #include <atomic>
 #include <filesystem>
 #include <fstream>
+#include <iostream>
 #include <random>
 #include <sstream>
+
+#ifndef _WIN32
+#include <csignal>
+#include <sys/resource.h>
+#include <sys/wait.h>
+#include <unistd.h>
+#endif
 
 namespace oxtest {
 
@@ -95,5 +103,63 @@ std::vector<std::string> MessageLog::take() {
     texts.clear();
     return result;
 }
+
+#ifndef _WIN32
+bool canFork() {
+    return true;
+}
+
+std::string inChild(const std::function<std::string()>& body, ChildLimits limits) {
+    int ends[2];
+    if (pipe(ends) != 0) {
+        return "no pipe";
+    }
+    std::cout.flush();
+    std::cerr.flush();
+    pid_t child = fork();
+    if (child < 0) {
+        close(ends[0]);
+        close(ends[1]);
+        return "no fork";
+    }
+    if (child == 0) {
+        close(ends[0]);
+        std::string result;
+        if (limits.dropRights && (setgid(65534) != 0 || setuid(65534) != 0)) {
+            result = "cannot drop rights";
+        } else {
+            if (limits.fileSizeLimit != 0) {
+                std::signal(SIGXFSZ, SIG_IGN);
+                rlimit limit{limits.fileSizeLimit, limits.fileSizeLimit};
+                setrlimit(RLIMIT_FSIZE, &limit);
+            }
+            result = body();
+        }
+        ssize_t written = write(ends[1], result.data(), result.size());
+        _exit(written == static_cast<ssize_t>(result.size()) ? 0 : 1);
+    }
+    close(ends[1]);
+    std::string result;
+    char buffer[4096];
+    for (ssize_t got; (got = read(ends[0], buffer, sizeof buffer)) > 0;) {
+        result.append(buffer, static_cast<size_t>(got));
+    }
+    close(ends[0]);
+    int status = 0;
+    waitpid(child, &status, 0);
+    if (!WIFEXITED(status) || WEXITSTATUS(status) != 0) {
+        return result + " [child ended abnormally, status " + std::to_string(status) + "]";
+    }
+    return result;
+}
+#else
+bool canFork() {
+    return false;
+}
+
+std::string inChild(const std::function<std::string()>&, ChildLimits) {
+    return "no fork on this platform";
+}
+#endif
 
 } // namespace oxtest

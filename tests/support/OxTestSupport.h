@@ -5,6 +5,7 @@
 
 #include "oxbase/platform/OxStrstream.h"
 
+#include <functional>
 #include <memory>
 #include <string>
 #include <vector>
@@ -64,6 +65,22 @@ private:
     std::vector<std::string> texts;
     std::unique_ptr<OxMsg> msg;
 };
+
+/// What a child process may be given before it runs its part of a test.
+struct ChildLimits {
+    /// Give up root rights (to user and group 65534), so that permission
+    /// bits bind; a child that cannot drop them reports so.
+    bool dropRights = false;
+    /// A file size limit in bytes (RLIMIT_FSIZE, SIGXFSZ ignored, so a write
+    /// beyond it fails with EFBIG); 0 for none.
+    unsigned long long fileSizeLimit = 0;
+};
+
+/// Runs `body` in a forked child under `limits` and returns the text it
+/// returned; a child that crashes or exits otherwise gives a text that says
+/// so. Only where processes can fork (not on Windows): `canFork()` tells.
+std::string inChild(const std::function<std::string()>& body, ChildLimits limits = {});
+bool canFork();
 
 } // namespace oxtest
 
