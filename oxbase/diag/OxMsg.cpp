@@ -1,6 +1,8 @@
 #include "oxbase/diag/OxMsg.h"
 
 #include "oxbase/core/OxString.h"
+#include "oxbase/diag/OxMsgTable.h"
+#include "oxbase/platform/OxPlatformFs.h"
 #include "oxbase/platform/OxPlatformPath.h"
 
 #include <cstdio>
@@ -21,7 +23,7 @@ char* OxMsg::buf = nullptr;
 int OxMsg::buflen = 0;
 std::ifstream* OxMsg::msgFile = nullptr;
 std::ofstream* OxMsg::logFile = nullptr;
-OxGBinaryTree<OxMsgRecord_s*>* OxMsg::msgTree = nullptr;
+OxMsgTable* OxMsg::msgTable = nullptr;
 char* OxMsg::msgFileName = nullptr;
 char* OxMsg::logFileName = nullptr;
 OxMsg::Callback OxMsg::pMsgCallback = nullptr;
@@ -154,7 +156,9 @@ OxMsg::OxMsg(const char* messageFileName, const char* msgDirectory, const char* 
         if (path.empty()) {
             return false;
         }
-        msgFile = new std::ifstream(OxPlatformNativePath(path.c_str()));
+        // Only a regular file is read: a directory or a FIFO planted under
+        // the name counts as no file, and the next place is tried.
+        msgFile = OxPlatformOpenInput(path.c_str(), false);
         if (msgFile->good()) {
             opened = path;
             return true;
@@ -193,8 +197,8 @@ OxMsg::OxMsg(const char* messageFileName, const char* msgDirectory, const char* 
     delete[] name;
 
     msgFileName = OxString::dup(opened.c_str());
-    if (msgTree == nullptr) {
-        msgTree = new OxGBinaryTree<OxMsgRecord_s*>;
+    if (msgTable == nullptr) {
+        msgTable = new OxMsgTable(msgList);
     }
     readMessageFile();
     closeAndDelete(msgFile);
@@ -222,6 +226,8 @@ void OxMsg::readMessageFile() {
     std::ifstream& in = *msgFile;
     unsigned int lineCount = 0;
     unsigned int number = 0;
+    bool memoryLeft = true;
+    char text[kTextLimit + 1];
     while (in.good()) {
         in >> std::dec >> number;
         lineCount++;
@@ -232,20 +238,17 @@ void OxMsg::readMessageFile() {
             in.ignore(kTextLimit, '\n'); // a comment line
             continue;
         }
-        char* text = new char[kTextLimit + 1];
-        OxGBinaryTree<OxMsgRecord_s*>::Node* node = msgTree->find(number);
-        if (node != msgTree->nullNode) {
+        if (msgTable->knows(number)) {
             // A known number continues the text of its message on a new line.
             readText(in, text);
-            OxMsgRecord_s* record = node->value;
-            char* joined = OxString::combine(record->text != nullptr ? record->text : "", "\n\t");
-            joined = OxString::append(joined, text);
-            delete[] record->text;
-            record->text = joined;
-            delete[] text;
+            memoryLeft = msgTable->continueText(number, text);
+            if (!memoryLeft) {
+                break;
+            }
             continue;
         }
-        auto* record = new OxMsgRecord_s;
+        std::uint32_t type = OxMsgTypeUnknown;
+        std::int32_t level = 0;
         char c = '\0';
         in >> c;
         if (c != ',') {
@@ -253,11 +256,10 @@ void OxMsg::readMessageFile() {
                       << ".  Setting message type to unknown."
                       << "\n"
                       << std::flush;
-            record->type = OxMsgTypeUnknown;
         } else {
             c = '\0';
             in >> c;
-            record->type = typeFromLetter(c);
+            type = typeFromLetter(c);
         }
         c = '\0';
         in >> c;
@@ -266,14 +268,22 @@ void OxMsg::readMessageFile() {
                       << ".  Setting message level to default value."
                       << "\n"
                       << std::flush;
-            record->level = 0;
         } else {
-            in >> std::dec >> record->level;
+            in >> std::dec >> level;
         }
         readText(in, text);
-        record->text = text;
-        msgList.append(record);
-        msgTree->insert(number, record);
+        memoryLeft = msgTable->add(number, type, level, text);
+        if (!memoryLeft) {
+            break;
+        }
+    }
+    // Joined texts are stored and every new text is checked, also when the
+    // reading ended early: what was read stays in force.
+    memoryLeft = msgTable->finish() && memoryLeft;
+    if (!memoryLeft) {
+        std::cerr << "FATAL: Dynamic storage allocation failure."
+                  << "\n"
+                  << std::flush;
     }
     if (!in.eof() && in.fail()) {
         std::cerr << "Error reading message file " << msgFileName << " at line " << lineCount
@@ -335,12 +345,11 @@ OxMsgRecord_s* OxMsg::format(unsigned int number, va_list arguments) {
     if (valid != OxTrue) {
         return nullptr;
     }
-    OxGBinaryTree<OxMsgRecord_s*>::Node* node = msgTree->find(number);
-    if (node == msgTree->nullNode) {
+    OxMsgRecord_s* record = msgTable != nullptr ? msgTable->find(number) : nullptr;
+    if (record == nullptr) {
         std::cerr << " There is no message at index " << number << "\n" << std::flush;
         return nullptr;
     }
-    OxMsgRecord_s* record = node->value;
     if (record->level != 0 && message_threshold > record->level) {
         return nullptr;
     }
@@ -474,12 +483,9 @@ void OxMsg::shutdown() {
     msgFileName = nullptr;
     delete[] logFileName;
     logFileName = nullptr;
-    delete msgTree;
-    msgTree = nullptr;
-    for (unsigned int i = 0; i < msgList.length; i++) {
-        delete[] msgList.data[i]->text;
-        delete msgList.data[i];
-    }
+    // The table releases the records, their texts and the list's array.
+    delete msgTable;
+    msgTable = nullptr;
     msgList.makeEmpty();
     message_threshold = 99;
     pMsgCallback = nullptr;

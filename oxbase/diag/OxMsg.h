@@ -13,12 +13,13 @@
 #ifndef OXBASE_DIAG_OXMSG_H
 #define OXBASE_DIAG_OXMSG_H
 
-#include "oxbase/core/OxGBinaryTree.h"
 #include "oxbase/core/OxGList.h"
 #include "oxbase/core/OxTypes.h"
 
 #include <cstdarg>
 #include <fstream>
+
+class OxMsgTable;
 
 enum OxMsgType : std::uint32_t {
     OxMsgTypeUnknown = 0,
@@ -104,7 +105,9 @@ private:
     static int buflen;
     static std::ifstream* msgFile;
     static std::ofstream* logFile;
-    static OxGBinaryTree<OxMsgRecord_s*>* msgTree;
+    /// The records by number: texts at their size and an index searched by
+    /// halving (see OxMsgTable). It owns the records of msgList.
+    static OxMsgTable* msgTable;
     static OxGList<OxMsgRecord_s*> msgList; // defined in oxbase/core/OxStatics.cpp
     static char* msgFileName;
     static char* logFileName;

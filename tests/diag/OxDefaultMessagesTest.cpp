@@ -1,5 +1,6 @@
 // The default message file must give every number the library logs a text
 // whose conversions consume exactly the arguments the library passes.
+#include "oxbase/diag/OxMsgNumbers.h"
 #include "support/OxTestSupport.h"
 
 #include <gtest/gtest.h>
@@ -33,12 +34,42 @@ TEST(OxDefaultMessages, EveryLoggedNumberHasAMatchingText) {
     const struct {
         unsigned int number;
         const char* arguments;
-    } logged[] = {{1, "s"},      {2, "s"},     {3, "s"},    {18, ""},      {19, ""},
-                  {20, ""},      {147, ""},    {152, ""},   {153, ""},     {169, ""},
-                  {179, "s"},    {180, "s"},   {181, "s"},  {182, "s"},    {228, "s"},
-                  {293, "sus"},  {294, "suu"}, {344, "ss"}, {484, "s"},    {560, ""},
-                  {561, ""},     {562, ""},    {564, ""},   {566, "suus"}, {567, "suuss"},
-                  {568, "suus"}, {569, "suu"}, {578, "s"},  {579, "s"}};
+    } logged[] = {{OxMsgFileOpen, "s"},
+                  {OxMsgFileRead, "s"},
+                  {OxMsgFileShortRead, "s"},
+                  {OxMsgStreamEnd, ""},
+                  {OxMsgStreamFailed, ""},
+                  {OxMsgStreamBad, ""},
+                  {OxMsgMemoryPastEnd, ""},
+                  {OxMsgMemoryBeforeStart, ""},
+                  {OxMsgMemoryBeyondEnd, ""},
+                  {OxMsgMatrixSingular, ""},
+                  {OxMsgFileWrite, "s"},
+                  {OxMsgDirectoryCreate, "s"},
+                  {OxMsgNotADirectory, "s"},
+                  {OxMsgFileRemoveExisting, "s"},
+                  {OxMsgFileClose, "s"},
+                  {OxMsgNoMemory, "s"},
+                  {OxMsgRangeSyntax, "sus"},
+                  {OxMsgRangeBackwards, "suu"},
+                  {OxMsgFileRemove, "ss"},
+                  {OxMsgCwdUnreadable, "s"},
+                  {OxMsgXmlNoQuote, ""},
+                  {OxMsgXmlNoDeclaration, ""},
+                  {OxMsgXmlInnerDeclaration, ""},
+                  {OxMsgXmlBadTagEnd, ""},
+                  {OxMsgXmlErrorPlace, "suus"},
+                  {OxMsgXmlEndTagMismatch, "suuss"},
+                  {OxMsgXmlSecondTopLevel, "suus"},
+                  {OxMsgXmlNulBytes, "suu"},
+                  {OxMsgCsvWritten, "s"},
+                  {OxMsgXmlWritten, "s"}};
+    // The library checks loaded texts against its own list: it must agree.
+    for (const auto& entry : logged) {
+        ASSERT_NE(OxMsgLibraryArguments(entry.number), nullptr) << entry.number;
+        EXPECT_STREQ(OxMsgLibraryArguments(entry.number), entry.arguments) << entry.number;
+    }
+    EXPECT_EQ(OxMsgLibraryArguments(4), nullptr);
     // The texts as they stand in the file, continuation lines included.
     std::string file = oxtest::readFile(oxtest::dataFile("oxbase.msg"));
     for (const auto& entry : logged) {

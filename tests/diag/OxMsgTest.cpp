@@ -11,7 +11,7 @@
 namespace {
 const char* const kMessages = "0 test messages\n"
                               "1,I,0Info %s\n"
-                              "2,W,0Warning %d\n"
+                              "42,W,0Warning %d\n"
                               "3,E,0Error %s\n"
                               "4,S,0Severe\n"
                               "5,F,0Fatal\n"
@@ -20,7 +20,7 @@ const char* const kMessages = "0 test messages\n"
                               "12,I,0First line\n"
                               "12 second line\n"
                               "1000,W,0Wide\n"
-                              "20,I,0Long %s\n";
+                              "40,I,0Long %s\n";
 
 void collect(const char* text, void* userData) {
     static_cast<std::vector<std::string>*>(userData)->push_back(text);
@@ -65,7 +65,7 @@ TEST_F(OxMsgTest, LevelsThresholdAndErrorCode) {
     EXPECT_EQ(OxMsg::getErrorCode(), OxErrorNone);
     OxMsg::Log(3u, "x");
     EXPECT_EQ(OxMsg::getErrorCode(), OxErrorError);
-    OxMsg::Log(2u, 1);
+    OxMsg::Log(42u, 1);
     EXPECT_EQ(OxMsg::getErrorCode(), OxErrorError);
     OxMsg::LogError(4u);
     EXPECT_EQ(OxMsg::getErrorCode(), OxErrorSevere);
@@ -134,12 +134,12 @@ TEST_F(OxMsgTest, FileFormatContinuationsWideNumbersAndLongTexts) {
 
     // A formatted text beyond the first buffer size is logged whole.
     std::string big(60000, 'z');
-    OxMsg::Log(20u, big.c_str());
+    OxMsg::Log(40u, big.c_str());
     std::string written = log();
-    EXPECT_NE(written.find(" 20I: Long " + big + "\n"), std::string::npos);
+    EXPECT_NE(written.find(" 40I: Long " + big + "\n"), std::string::npos);
     EXPECT_EQ(callbackTexts.back(), "Long " + big);
     std::string huge(300000, 'h'); // several doublings
-    EXPECT_EQ(std::string(OxMsg::LogToString(20u, huge.c_str())), "Long " + huge);
+    EXPECT_EQ(std::string(OxMsg::LogToString(40u, huge.c_str())), "Long " + huge);
 }
 
 TEST_F(OxMsgTest, BadMessageFilesKeepWhatWasRead) {
@@ -227,4 +227,77 @@ TEST_F(OxMsgTest, StartUpFailuresAndLookup) {
     }
     EXPECT_EQ(testing::internal::GetCapturedStderr(),
               " Unable to open " + dir.path() + "/no/such/dir/run.log\n");
+}
+
+TEST_F(OxMsgTest, PlantedTextsNeverWriteOrReadMissingArguments) {
+    // 1 and 566 are logged by the library ("s" and "suus"); 9 is the
+    // application's own. The 566 continuation adds a fifth conversion.
+    const char* planted = "1,E,0open %s %s %s\n"
+                          "9,I,0count%-5hn here %s\n"
+                          "3,E,0Full: 100%% of %s\n"
+                          "566,E,0In %s line %u\n"
+                          "566 offset %u: %s %s\n"
+                          "293,E,0%1$s at %2$u\n"
+                          "294,E,0%s %u-%u%%n\n";
+    testing::internal::CaptureStderr();
+    auto msg = start(planted, nullptr);
+    std::string reports = testing::internal::GetCapturedStderr();
+    EXPECT_EQ(reports,
+              " Message 1: its text does not fit the arguments the library passes; a safe text is "
+              "used.\n"
+              " Message 9: a %n conversion in its text is refused and prints as %p.\n"
+              " Message 293: its text does not fit the arguments the library passes; a safe text "
+              "is used.\n"
+              " Message 566: its text does not fit the arguments the library passes; a safe text "
+              "is used.\n");
+    ASSERT_EQ(OxMsg::isValid(), OxTrue);
+    EXPECT_STREQ(OxMsg::LogToString(1u, "a.xml"), "Message 1: a.xml");
+    EXPECT_STREQ(OxMsg::LogToString(566u, "a.xml", 3u, 4u, "<x"), "Message 566: a.xml 3 4 <x");
+    EXPECT_STREQ(OxMsg::LogToString(293u, "range", 2u, "1-"), "Message 293: range 2 1-");
+    EXPECT_STREQ(OxMsg::LogToString(3u, "f"), "Full: 100% of f");
+    EXPECT_STREQ(OxMsg::LogToString(294u, "range", 5u, 2u), "range 5-2%n");
+
+    // The application's %n prints the pointer instead of writing through it,
+    // and the conversion behind it still meets its own argument.
+    int untouched = 12345;
+    std::string counted = OxMsg::LogToString(9u, &untouched, "s");
+    EXPECT_EQ(untouched, 12345);
+    char expected[64];
+    std::snprintf(expected, sizeof expected, "count%5p here s", static_cast<void*>(&untouched));
+    EXPECT_EQ(counted, expected);
+}
+
+TEST_F(OxMsgTest, ManyMessagesInAnyOrderAndLongContinuations) {
+    // Numbers descending, then a long run of continuations of two messages
+    // that take turns: every record is found, every join is in file order.
+    std::string messages;
+    for (unsigned int n = 3000; n >= 100; n--) {
+        messages += std::to_string(n) + ",I,0m" + std::to_string(n) + "\n";
+    }
+    std::string first = "a", second = "b";
+    messages += "50,I,0a\n51,I,0b\n";
+    for (int i = 0; i < 20000; i++) {
+        std::string piece = std::to_string(i);
+        messages += (i % 2 == 0 ? "50 " : "51 ") + piece + "\n";
+        (i % 2 == 0 ? first : second) += "\n\t " + piece;
+    }
+    auto msg = start(messages.c_str(), nullptr);
+    for (unsigned int n = 100; n <= 3000; n += 7) {
+        ASSERT_STREQ(OxMsg::LogToString(n), ("m" + std::to_string(n)).c_str());
+    }
+    EXPECT_EQ(std::string(OxMsg::LogToString(50u)), first);
+    EXPECT_EQ(std::string(OxMsg::LogToString(51u)), second);
+    testing::internal::CaptureStderr();
+    EXPECT_EQ(OxMsg::LogToString(99u), nullptr);
+    EXPECT_EQ(OxMsg::LogToString(3001u), nullptr);
+    testing::internal::GetCapturedStderr();
+}
+
+TEST(OxDefaultMessageFile, LoadsWithoutReports) {
+    testing::internal::CaptureStderr();
+    {
+        OxMsg msg(oxtest::dataFile("oxbase.msg").c_str(), nullptr, nullptr, nullptr);
+        EXPECT_EQ(OxMsg::isValid(), OxTrue);
+    }
+    EXPECT_EQ(testing::internal::GetCapturedStderr(), "");
 }

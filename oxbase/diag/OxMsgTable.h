@@ -1,0 +1,93 @@
+// OxMsgTable.h: the loaded messages of the message subsystem, by number.
+//
+// The records stay in OxMsg's list in file order; this table stores their
+// texts at their size and finds a record by its number. A large message file
+// costs about 40 bytes a message besides its text: records come from a pool,
+// texts from blocks shared by many, and the index holds the number and the
+// list position of each record, sorted by number for a search by halving.
+// While a file loads, numbers may come in any order: the index then grows as
+// sorted runs of powers of two, merged like the carries of a binary counter,
+// so a load of n messages takes O(n log n) whatever the order of the file.
+//
+//   OxMsgTable table(records);
+//   table.add(12, OxMsgTypeError, 0, "Cannot read %s");
+//   table.continueText(12, "second line");
+//   table.finish();   // "Cannot read %s\n\tsecond line", checked
+#ifndef OXBASE_DIAG_OXMSGTABLE_H
+#define OXBASE_DIAG_OXMSGTABLE_H
+
+#include "oxbase/core/OxGList.h"
+
+#include <cstddef>
+#include <cstdint>
+#include <string>
+#include <unordered_map>
+#include <vector>
+
+struct OxMsgRecord_s;
+
+class OxMsgTable {
+public:
+    /// A table that appends its records to `records` and owns them, their
+    /// texts and the list's array from then on.
+    explicit OxMsgTable(OxGList<OxMsgRecord_s*>& records);
+    /// Releases every record and text and empties the list.
+    ~OxMsgTable();
+    OxMsgTable(const OxMsgTable&) = delete;
+    OxMsgTable& operator=(const OxMsgTable&) = delete;
+
+    /// The record of `number`, or null.
+    OxMsgRecord_s* find(unsigned int number) const;
+    /// Whether a record of `number` exists (added, finished or not).
+    bool knows(unsigned int number) const;
+
+    /// A new record for `number`, which the table does not know, with a copy
+    /// of `text`, appended to the list. False when memory ran out; the table
+    /// is then as it was.
+    bool add(unsigned int number, std::uint32_t type, std::int32_t level, const char* text);
+    /// Joins "\n\t" and `text` to the text of the known `number`. The joined
+    /// text is kept aside and stored at its size by `finish`, so that a long
+    /// run of continuation lines costs linear time. False when memory ran
+    /// out or the number is unknown.
+    bool continueText(unsigned int number, const char* text);
+
+    /// Ends a load: stores the joined texts, then checks every text added or
+    /// changed since the last finish. A %n conversion is made harmless (see
+    /// OxMsgFormatDisarm); a text of a number the library logs that does not
+    /// fit its arguments (OxMsgLibraryArguments) is replaced by a safe text
+    /// that shows the arguments, "Message 566: %s %u %u %s". Each of these is
+    /// reported on standard error. False when memory ran out for a text; the
+    /// record then keeps its first line.
+    bool finish();
+
+private:
+    struct Entry {
+        std::uint32_t number;
+        std::uint32_t position; ///< index in the list
+    };
+    struct Block;
+
+    static bool byNumber(const Entry& a, const Entry& b);
+
+    /// The position of `number` in the list, or -1.
+    long long locate(unsigned int number) const;
+    void insert(Entry entry);
+    /// Merges the runs into one: a search is then one halving.
+    void mergeRuns();
+    /// A copy of `length` bytes of `text` and a NUL in the text blocks; null
+    /// when memory ran out.
+    char* store(const char* text, std::size_t length);
+    /// Disarms and checks the text of `record`, reporting on standard error.
+    bool check(unsigned int number, OxMsgRecord_s* record);
+
+    OxGList<OxMsgRecord_s*>& records;
+    std::vector<Entry> entries;       ///< sorted runs, largest first
+    std::vector<std::size_t> runs;    ///< their sizes, powers of two, decreasing
+    std::uint32_t firstUnchecked = 0; ///< list position of the first record of this load
+    std::unordered_map<std::uint32_t, std::string> joined; ///< list position to joined text
+    Block* blocks = nullptr;                               ///< text blocks, newest first
+    char* unused = nullptr;                                ///< the free part of the newest block
+    std::size_t unusedSize = 0;
+};
+
+#endif
