@@ -43,6 +43,10 @@ constexpr LoggedMessage kLogged[] = {
 
 } // namespace
 
+unsigned int OxMsgLibraryNumber(unsigned int index) {
+    return index < sizeof kLogged / sizeof kLogged[0] ? kLogged[index].number : 0;
+}
+
 const char* OxMsgLibraryArguments(unsigned int number) {
     for (const LoggedMessage& message : kLogged) {
         if (message.number == number) {

@@ -52,6 +52,10 @@ enum OxMsgNumber : unsigned int {
     OxMsgXmlWritten = 579  ///< file name: the end of the write of an XML file
 };
 
+/// The numbers the library logs, ascending: index 0, 1, ... gives each in
+/// turn, and 0 once the index is past the last.
+unsigned int OxMsgLibraryNumber(unsigned int index);
+
 /// The kinds of the arguments the library passes with `number`, in order
 /// ("s" text, "u" unsigned number, "" none), or null for a number the
 /// library does not log. Where call sites differ (180), the shortest list.

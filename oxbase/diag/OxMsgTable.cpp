@@ -6,6 +6,7 @@
 #include "oxbase/diag/OxMsgNumbers.h"
 
 #include <algorithm>
+#include <cstdio>
 #include <cstring>
 #include <iostream>
 #include <new>
@@ -18,11 +19,18 @@ OxSlabPool recordPool(sizeof(OxMsgRecord_s));
 /// Texts share blocks of this size; a longer text gets a block of its own.
 constexpr std::size_t kBlockSize = 64 * 1024;
 
-} // namespace
+/// Filter bits for each number in the table.
+constexpr std::size_t kFilterBitsPerNumber = 16;
 
-bool OxMsgTable::byNumber(const Entry& a, const Entry& b) {
-    return a.number < b.number;
+/// The filter bit of `number` among `bits` (a power of two): Fibonacci
+/// hashing spreads neighbouring numbers.
+std::size_t filterBit(unsigned int number, std::size_t bits) {
+    return static_cast<std::size_t>((static_cast<std::uint64_t>(number) * 0x9E3779B97F4A7C15ull) >>
+                                    32) &
+           (bits - 1);
 }
+
+} // namespace
 
 struct OxMsgTable::Block {
     Block* next;
@@ -50,7 +58,7 @@ long long OxMsgTable::locate(unsigned int number) const {
     for (std::size_t size : runs) {
         auto first = entries.begin() + static_cast<std::ptrdiff_t>(start);
         auto last = first + static_cast<std::ptrdiff_t>(size);
-        auto at = std::lower_bound(first, last, key, byNumber);
+        auto at = std::lower_bound(first, last, key, ByNumber());
         if (at != last && at->number == number) {
             return at->position;
         }
@@ -65,7 +73,33 @@ OxMsgRecord_s* OxMsgTable::find(unsigned int number) const {
 }
 
 bool OxMsgTable::knows(unsigned int number) const {
-    return locate(number) >= 0;
+    return mayKnow(number) && locate(number) >= 0;
+}
+
+bool OxMsgTable::mayKnow(unsigned int number) const {
+    if (filter.empty()) {
+        return !entries.empty();
+    }
+    std::size_t bit = filterBit(number, filter.size() * 64);
+    return (filter[bit / 64] >> (bit % 64) & 1u) != 0;
+}
+
+void OxMsgTable::remember(unsigned int number) {
+    std::size_t bits = filter.size() * 64;
+    if (bits < entries.size() * kFilterBitsPerNumber) {
+        std::size_t grown = bits == 0 ? 1024 : bits;
+        while (grown < entries.size() * kFilterBitsPerNumber * 2) {
+            grown *= 2;
+        }
+        filter.assign(grown / 64, 0);
+        for (const Entry& entry : entries) {
+            std::size_t at = filterBit(entry.number, grown);
+            filter[at / 64] |= std::uint64_t(1) << (at % 64);
+        }
+        bits = grown;
+    }
+    std::size_t at = filterBit(number, bits);
+    filter[at / 64] |= std::uint64_t(1) << (at % 64);
 }
 
 void OxMsgTable::insert(Entry entry) {
@@ -76,7 +110,7 @@ void OxMsgTable::insert(Entry entry) {
         // takes a buffer when it can have one and works in place otherwise.
         auto end = entries.end();
         std::inplace_merge(end - static_cast<std::ptrdiff_t>(2 * size),
-                           end - static_cast<std::ptrdiff_t>(size), end, byNumber);
+                           end - static_cast<std::ptrdiff_t>(size), end, ByNumber());
         runs.pop_back();
         size *= 2;
     }
@@ -91,7 +125,7 @@ void OxMsgTable::mergeRuns() {
         runs.back() = merged;
         auto end = entries.end();
         std::inplace_merge(end - static_cast<std::ptrdiff_t>(merged),
-                           end - static_cast<std::ptrdiff_t>(last), end, byNumber);
+                           end - static_cast<std::ptrdiff_t>(last), end, ByNumber());
     }
 }
 
@@ -145,6 +179,7 @@ bool OxMsgTable::add(unsigned int number, std::uint32_t type, std::int32_t level
     try {
         records.append(record);
         insert(Entry{number, position});
+        remember(number);
     } catch (const std::bad_alloc&) {
         records.length = position;
         recordPool.release(record);
@@ -177,52 +212,69 @@ bool OxMsgTable::continueText(unsigned int number, const char* text) {
 bool OxMsgTable::finish() {
     bool complete = true;
     mergeRuns();
-    for (const Entry& entry : entries) {
-        OxMsgRecord_s* record = records.data[entry.position];
-        auto found = joined.find(entry.position);
-        if (found != joined.end()) {
-            char* text = store(found->second.data(), found->second.size());
-            if (text != nullptr) {
-                record->text = text;
-            } else {
-                complete = false;
-            }
-        } else if (entry.position < firstUnchecked) {
-            continue; // checked by an earlier load and not changed since
-        }
-        try {
-            complete = check(entry.number, record) && complete;
-        } catch (const std::bad_alloc&) {
-            // No memory for the report or the safe text: a text with no
-            // conversion reads nothing and is always safe.
-            record->text[0] = '\0';
+    // Texts that continuation lines made longer, then every text of this
+    // load, in file order: a %n is made harmless wherever it stands.
+    for (auto& [position, text] : joined) {
+        char* stored = store(text.data(), text.size());
+        if (stored == nullptr) {
             complete = false;
+            continue;
+        }
+        records.data[position]->text = stored;
+        if (position < firstUnchecked) {
+            disarm(position);
         }
     }
     joined.clear();
+    for (std::uint32_t position = firstUnchecked; position < records.length; position++) {
+        disarm(position);
+    }
     firstUnchecked = records.length;
+    // The numbers the library logs: their texts must take its arguments.
+    for (unsigned int i = 0, number; (number = OxMsgLibraryNumber(i)) != 0; i++) {
+        OxMsgRecord_s* record = find(number);
+        if (record != nullptr) {
+            complete = checkArguments(number, record) && complete;
+        }
+    }
     return complete;
 }
 
-bool OxMsgTable::check(unsigned int number, OxMsgRecord_s* record) {
-    if (OxMsgFormatDisarm(record->text) > 0) {
-        std::cerr << " Message " << number
+std::uint32_t OxMsgTable::numberAt(std::uint32_t position) const {
+    for (const Entry& entry : entries) {
+        if (entry.position == position) {
+            return entry.number;
+        }
+    }
+    return 0;
+}
+
+void OxMsgTable::disarm(std::uint32_t position) {
+    if (OxMsgFormatDisarm(records.data[position]->text) > 0) {
+        std::cerr << " Message " << numberAt(position)
                   << ": a %n conversion in its text is refused and prints as %p.\n"
                   << std::flush;
     }
+}
+
+bool OxMsgTable::checkArguments(unsigned int number, OxMsgRecord_s* record) {
     const char* arguments = OxMsgLibraryArguments(number);
-    if (arguments == nullptr || OxMsgFormatFits(record->text, arguments)) {
+    if (OxMsgFormatFits(record->text, arguments)) {
         return true;
     }
     std::cerr << " Message " << number
               << ": its text does not fit the arguments the library passes; a safe text is "
                  "used.\n"
               << std::flush;
-    std::string safe = "Message " + std::to_string(number) + ":";
-    for (const char* kind = arguments; *kind != '\0'; kind++) {
-        safe += *kind == 's' ? " %s" : " %u";
+    // "Message 566: %s %u %u %s" shows what the library passed. Built in a
+    // fixed buffer: nothing here may fail but the store.
+    char safe[64];
+    int length = std::snprintf(safe, sizeof safe, "Message %u:", number);
+    for (const char* kind = arguments; *kind != '\0' && length + 3 < int(sizeof safe); kind++) {
+        length += std::snprintf(safe + length, sizeof safe - static_cast<std::size_t>(length),
+                                *kind == 's' ? " %%s" : " %%u");
     }
-    char* text = store(safe.data(), safe.size());
+    char* text = store(safe, static_cast<std::size_t>(length));
     if (text == nullptr) {
         record->text[0] = '\0'; // no conversion at all reads nothing
         return false;

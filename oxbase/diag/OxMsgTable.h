@@ -66,8 +66,19 @@ private:
         std::uint32_t position; ///< index in the list
     };
     struct Block;
+    /// Orders entries by number (a type, so that the searches inline it).
+    struct ByNumber {
+        bool operator()(const Entry& a, const Entry& b) const { return a.number < b.number; }
+    };
 
-    static bool byNumber(const Entry& a, const Entry& b);
+    /// Whether `number` may be in the table: false is certain, true is
+    /// right but for about one number in sixteen (one bit of a filter of 16
+    /// bits a number, hashed). It spares a search of every run for the new
+    /// numbers of a load, which are most of them.
+    bool mayKnow(unsigned int number) const;
+    /// Sets the filter bit of `number`; rebuilds the filter at twice the
+    /// size when the table outgrew it.
+    void remember(unsigned int number);
 
     /// The position of `number` in the list, or -1.
     long long locate(unsigned int number) const;
@@ -77,14 +88,21 @@ private:
     /// A copy of `length` bytes of `text` and a NUL in the text blocks; null
     /// when memory ran out.
     char* store(const char* text, std::size_t length);
-    /// Disarms and checks the text of `record`, reporting on standard error.
-    bool check(unsigned int number, OxMsgRecord_s* record);
+    /// The number of the record at list `position` (a scan: for reports).
+    std::uint32_t numberAt(std::uint32_t position) const;
+    /// Disarms %n in the text at list `position`, reporting on standard error.
+    void disarm(std::uint32_t position);
+    /// Replaces the text of `record`, a record of a number the library logs,
+    /// when it does not fit the arguments the library passes. False when
+    /// memory ran out for the safe text.
+    bool checkArguments(unsigned int number, OxMsgRecord_s* record);
 
     OxGList<OxMsgRecord_s*>& records;
     std::vector<Entry> entries;       ///< sorted runs, largest first
     std::vector<std::size_t> runs;    ///< their sizes, powers of two, decreasing
     std::uint32_t firstUnchecked = 0; ///< list position of the first record of this load
     std::unordered_map<std::uint32_t, std::string> joined; ///< list position to joined text
+    std::vector<std::uint64_t> filter;                     ///< see mayKnow
     Block* blocks = nullptr;                               ///< text blocks, newest first
     char* unused = nullptr;                                ///< the free part of the newest block
     std::size_t unusedSize = 0;

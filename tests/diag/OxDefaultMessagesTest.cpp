@@ -70,6 +70,12 @@ TEST(OxDefaultMessages, EveryLoggedNumberHasAMatchingText) {
         EXPECT_STREQ(OxMsgLibraryArguments(entry.number), entry.arguments) << entry.number;
     }
     EXPECT_EQ(OxMsgLibraryArguments(4), nullptr);
+    unsigned int count = 0;
+    for (unsigned int previous = 0; OxMsgLibraryNumber(count) != 0; count++) {
+        EXPECT_GT(OxMsgLibraryNumber(count), previous); // ascending, each once
+        previous = OxMsgLibraryNumber(count);
+    }
+    EXPECT_EQ(count, sizeof logged / sizeof logged[0]);
     // The texts as they stand in the file, continuation lines included.
     std::string file = oxtest::readFile(oxtest::dataFile("oxbase.msg"));
     for (const auto& entry : logged) {

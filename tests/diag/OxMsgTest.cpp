@@ -243,9 +243,9 @@ TEST_F(OxMsgTest, PlantedTextsNeverWriteOrReadMissingArguments) {
     auto msg = start(planted, nullptr);
     std::string reports = testing::internal::GetCapturedStderr();
     EXPECT_EQ(reports,
+              " Message 9: a %n conversion in its text is refused and prints as %p.\n"
               " Message 1: its text does not fit the arguments the library passes; a safe text is "
               "used.\n"
-              " Message 9: a %n conversion in its text is refused and prints as %p.\n"
               " Message 293: its text does not fit the arguments the library passes; a safe text "
               "is used.\n"
               " Message 566: its text does not fit the arguments the library passes; a safe text "
