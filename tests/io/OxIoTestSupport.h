@@ -18,7 +18,8 @@ namespace oxiotest {
 inline const char* messageFile() {
     return "1,I,0m1 %s\n2,I,0m2 %s\n3,I,0m3 %s\n18,I,0m18\n19,I,0m19\n20,I,0m20\n"
            "147,I,0m147\n152,I,0m152\n153,I,0m153\n179,I,0m179 %s\n180,I,0m180 %s\n"
-           "181,I,0m181 %s\n182,I,0m182 %s\n183,I,0m183 %s\n344,I,0m344 %s %s\n484,I,0m484 %s\n";
+           "181,I,0m181 %s\n182,I,0m182 %s\n183,I,0m183 %s\n344,I,0m344 %s %s\n484,I,0m484 %s\n"
+           "578,I,0m578 %s\n579,I,0m579 %s\n";
 }
 
 /// A scratch directory and a running message subsystem that records every
