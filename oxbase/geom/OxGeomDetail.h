@@ -6,7 +6,7 @@
 // writing stops at the first failed write and counts the bytes before it.
 //
 //   oxdetail::setIdentity<4>(m);
-//   long long bytes = oxdetail::writeFields(output, fields, oxdetail::Unscaled());
+//   long long bytes = oxdetail::writeFields(output, fields, oxdetail::Scaled{2.0f});
 //   float f = oxdetail::narrow(1e300);   // +infinity, by the IEEE rule
 #ifndef OXBASE_GEOM_OXGEOMDETAIL_H
 #define OXBASE_GEOM_OXGEOMDETAIL_H
@@ -96,11 +96,21 @@ long long writeFields(OxOutput& output, const std::array<T*, K>& fields, Transfo
     return written;
 }
 
-/// Multiplies every field by `scale`, the product in float.
-template <std::size_t K> void scaleFields(const std::array<float*, K>& fields, float scale) {
+/// The value a float field is written as under a scale: the product in float.
+struct Scaled {
+    float scale;
+    float operator()(float value) const { return scale * value; }
+};
+
+/// readFields, then every field multiplied by `scale` in float, the fields
+/// that failed to read too. Returns the sum of the reads' results.
+template <std::size_t K>
+long long readScaledFields(OxInput& input, const std::array<float*, K>& fields, float scale) {
+    const long long total = readFields(input, fields);
     for (float* field : fields) {
         *field *= scale;
     }
+    return total;
 }
 
 } // namespace oxdetail

@@ -92,11 +92,7 @@ TEST(OxMatrix, DeterminantsAndSetters) {
     double out[4][4];
     moved.getValue(out);
     const double translation[4][4] = {{1, 0, 0, 7}, {0, 1, 0, 8}, {0, 0, 1, 9}, {0, 0, 0, 1}};
-    for (int i = 0; i < 4; i++) {
-        for (int j = 0; j < 4; j++) {
-            EXPECT_EQ(out[i][j], translation[i][j]) << i << "," << j;
-        }
-    }
+    EXPECT_TRUE(std::equal(&out[0][0], &out[0][0] + 16, &translation[0][0]));
     EXPECT_EQ((*worked.getValue())[2][1], 6.0);
     moved = worked;
     EXPECT_EQ(moved.det4(), 72.0);
