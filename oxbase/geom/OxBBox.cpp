@@ -36,15 +36,21 @@ void getFields(const std::array<const T*, K>& fields, const std::array<T*, K>& v
     }
 }
 
-/// Lower fields take the smaller, upper fields the larger value; fmin and
-/// fmax let a number win over NaN.
+/// The smaller (Lower) or larger of two values; a number wins over NaN, as
+/// with fmin and fmax, but inline, so that a long union stays in registers.
+template <bool Lower, class T> T pick(T mine, T other) {
+    const bool otherWins = Lower ? other < mine : other > mine;
+    return otherWins || std::isnan(mine) ? other : mine;
+}
+
+/// Lower fields take the smaller value, upper fields the larger.
 template <class T, std::size_t K>
 void unite(const std::array<T*, K>& self, const std::array<const T*, K>& other) {
     for (std::size_t i = 0; i < K / 2; i++) {
-        *self[i] = std::fmin(*self[i], *other[i]);
+        *self[i] = pick<true>(*self[i], *other[i]);
     }
     for (std::size_t i = K / 2; i < K; i++) {
-        *self[i] = std::fmax(*self[i], *other[i]);
+        *self[i] = pick<false>(*self[i], *other[i]);
     }
 }
 
