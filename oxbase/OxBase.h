@@ -43,8 +43,13 @@
 #include "oxbase/doc/OxXmlFileList.h"
 
 // Geometry
+#include "oxbase/geom/OxBBox.h"
+#include "oxbase/geom/OxBSphere.h"
 #include "oxbase/geom/OxColor.h"
 #include "oxbase/geom/OxLimits.h"
+#include "oxbase/geom/OxLine.h"
+#include "oxbase/geom/OxMatrix.h"
+#include "oxbase/geom/OxPlane.h"
 #include "oxbase/geom/OxRot.h"
 #include "oxbase/geom/OxVec.h"
 

@@ -1,6 +1,7 @@
 #include "oxbase/geom/OxRot.h"
 
 #include "oxbase/diag/OxMsg.h"
+#include "oxbase/geom/OxGeomDetail.h"
 #include "oxbase/geom/OxLimits.h"
 #include "oxbase/io/OxInput.h"
 #include "oxbase/io/OxOutput.h"
@@ -9,27 +10,15 @@
 #include <iomanip>
 #include <utility>
 
-// OxRot and OxRot2d differ only in their dimension; the helpers below serve
-// both through their row arrays.
+// OxRot and OxRot2d differ only in their dimension; the helpers below, and
+// those of OxGeomDetail.h, serve both through their row arrays.
 namespace {
+using oxdetail::copyMatrix;
+using oxdetail::scaleMatrix;
+using oxdetail::setIdentity;
+
 constexpr double kFixedTolerance = 1e-5;
 constexpr int kSingularMatrix = 169;
-
-template <int N> void setIdentity(double (&m)[N][N]) {
-    for (int i = 0; i < N; i++) {
-        for (int j = 0; j < N; j++) {
-            m[i][j] = i == j ? 1.0 : 0.0;
-        }
-    }
-}
-
-template <int N> void copyMatrix(double (&to)[N][N], double const (&from)[N][N]) {
-    for (int i = 0; i < N; i++) {
-        for (int j = 0; j < N; j++) {
-            to[i][j] = from[i][j];
-        }
-    }
-}
 
 template <int N> bool exactIdentity(double const (&m)[N][N]) {
     for (int i = 0; i < N; i++) {
@@ -65,14 +54,6 @@ template <int N> void swapMatrixColumns(double (&m)[N][N], unsigned int a, unsig
     }
     for (int i = 0; i < N; i++) {
         std::swap(m[i][a], m[i][b]);
-    }
-}
-
-template <int N> void scaleMatrix(double (&m)[N][N], const double* diagonal) {
-    for (int i = 0; i < N; i++) {
-        for (int j = 0; j < N; j++) {
-            m[i][j] = i == j ? diagonal[i] : 0.0;
-        }
     }
 }
 

@@ -10,6 +10,10 @@ TEST(OxBaseHeader, EverySubsystemIsReachable) {
     EXPECT_EQ(ranges.isValid(), OxTrue);
     EXPECT_EQ(ranges.isInRange(2), OxTrue);
     EXPECT_EQ(OX_IDENTITY_3X3_MATRIX.isIdentity(), OxTrue);
+    EXPECT_EQ(OxMatrix().det4(), 1.0);
+    EXPECT_EQ((OxBBox() + OxBBox(0, 0, 0, 1, 1, 1)).isEmpty(), OxFalse);
+    EXPECT_EQ(OxBSphere().isEmpty(), OxTrue);
+    EXPECT_EQ(OxLine().isInfinite(), OxTrue);
     OxXmlElement element("part");
     EXPECT_EQ(element.isNamed("part"), OxTrue);
     char* text = OxString::toString(2.5);
