@@ -33,14 +33,16 @@
 //   per-thread caches (tcache) and fastbins are in use as far as the arena
 //   knows, so they are delivered as used. The walk reads the arena without
 //   lock: it is taken while no other thread allocates.
-//   Before its first walk the walker checks that malloc really is glibc's
-//   main arena: a freshly allocated small block (allocated and freed again
-//   before anything of the arena is read) must lie in the located arena, its
-//   chunk header must validate and agree with malloc_usable_size, and the
-//   chain of chunks from the first one must reach it. Under valgrind, with a
-//   preloaded allocator or from another thread's arena this fails and the
-//   walk ends at once, without reading the heap. A success is remembered for
-//   the rest of the process, a failure is checked again at the next walk.
+//   At the start of its first walk (before the arena is located for it)
+//   the walker checks that malloc really is glibc's main arena: a small
+//   block is allocated, and nothing of the heap is read unless its address
+//   lies in the located arena; then its chunk header must validate and
+//   agree with malloc_usable_size, and the chain of chunks from the first
+//   one must reach it; then it is freed. Under valgrind, with a preloaded
+//   allocator or from another thread's arena this fails and the walk ends
+//   at once, without reading the heap. A success is remembered for the
+//   rest of the process (later walks allocate nothing), a failure is
+//   checked again at the next walk.
 // - Built with AddressSanitizer (or another sanitizer that replaces malloc),
 //   with a C library other than glibc, or on any other platform: every walk
 //   ends at once.
