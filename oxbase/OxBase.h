@@ -22,6 +22,9 @@
 #include "oxbase/core/OxTypes.h"
 
 // Diagnostics
+#include "oxbase/diag/OxCounters.h"
+#include "oxbase/diag/OxFlavor.h"
+#include "oxbase/diag/OxHeapInfo.h"
 #include "oxbase/diag/OxMsg.h"
 #include "oxbase/diag/OxPrt.h"
 

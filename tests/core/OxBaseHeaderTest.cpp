@@ -16,6 +16,14 @@ TEST(OxBaseHeader, EverySubsystemIsReachable) {
     EXPECT_EQ(OxLine().isInfinite(), OxTrue);
     OxXmlElement element("part");
     EXPECT_EQ(element.isNamed("part"), OxTrue);
+    OxCounters counters;
+    counters.add("parts");
+    EXPECT_EQ(counters.exists("parts"), OxTrue);
+    OxGList<OxFlavorEntry*> table;
+    OxFlavor flavors(table);
+    EXPECT_EQ(flavors.addFlavor("none"), OxFalse);
+    OxHeapInfo picture;
+    EXPECT_EQ(picture.getCount(), 0u);
     char* text = OxString::toString(2.5);
     EXPECT_STREQ(text, "2.5");
     delete[] text;
