@@ -89,28 +89,44 @@ public:
     }
 
     /// Stores `value` behind the last element; returns the index it got.
+    /// `value` may be an element of this list: it is copied before the array
+    /// grows. A list of 2^31 elements cannot grow: the value is not stored
+    /// and the result is the unchanged length.
     unsigned int append(const T& value) {
         if (capacity <= length) {
+            T copy = value;
             reserve(length + 1);
+            if (capacity <= length) {
+                return length;
+            }
+            data[length] = copy;
+        } else {
+            data[length] = value;
         }
-        data[length] = value;
         return length++;
     }
 
     /// The slot at `index`, after the range report when `index` > `length`.
+    /// An index with no slot in the array (at or beyond the capacity, or any
+    /// index of a list without storage) yields a spare slot that holds a
+    /// value-initialised T, so that such a mistake never touches memory
+    /// outside the array.
     T& operator[](unsigned int index) {
         checkRange(index);
-        return data[index];
+        return index < capacity ? data[index] : spareSlot();
     }
     const T& operator[](unsigned int index) const {
         checkRange(index);
-        return data[index];
+        return index < capacity ? data[index] : spareSlot();
     }
 
-    /// Stores `value` in the slot at `index`, after the same range report.
+    /// Stores `value` in the slot at `index`, after the same range report; an
+    /// index with no slot stores nothing.
     void set(unsigned int index, const T& value) {
         checkRange(index);
-        data[index] = value;
+        if (index < capacity) {
+            data[index] = value;
+        }
     }
 
     /// Releases the array (not the pointees): capacity 0, length 0.
@@ -156,6 +172,14 @@ public:
     }
 
 private:
+    /// One slot per element type for indices outside the array, cleared
+    /// at every use (the library runs on one thread at a time).
+    static T& spareSlot() {
+        static T slot{};
+        slot = T();
+        return slot;
+    }
+
     void checkRange(unsigned int index) const {
         if (index > length) {
             oxdetail::reportListRange(index, length);

@@ -4,6 +4,8 @@
 
 #include <gtest/gtest.h>
 
+#include <string>
+
 #include <algorithm>
 #include <random>
 #include <sstream>
@@ -65,6 +67,32 @@ TEST(OxGList, RangeReportOnlyBeyondLength) {
     list.set(3, 1);
     EXPECT_EQ(testing::internal::GetCapturedStdout(),
               "Ooops, trying to access element 3 in OxList of length 2\n");
+
+    // Index equal to length at full capacity, and on a list without storage:
+    // not reported, and no memory outside the array is touched (AddressSanitizer
+    // watches the build of the sanitizer preset).
+    list.append(10);
+    list.append(11);
+    ASSERT_EQ(list.capacity, list.getLength());
+    list[4] = 12;
+    EXPECT_EQ(list[4], 0u);
+    list.makeEmpty();
+    list[0] = 5;
+    list.set(0, 6);
+    EXPECT_EQ(list.capacity, 0u);
+}
+
+TEST(OxGList, AppendOfItsOwnElementAtFullCapacity) {
+    // The element is read before the array it lives in is replaced.
+    OxGList<std::string> words;
+    for (const char* w : {"alpha", "beta", "gamma", "delta"}) {
+        words.append(w);
+    }
+    ASSERT_EQ(words.capacity, 4u);
+    words.append(words[1]);
+    ASSERT_EQ(words.getLength(), 5u);
+    EXPECT_EQ(words[4], "beta");
+    EXPECT_EQ(words[1], "beta");
 }
 
 TEST(OxGList, CopySharesPointeesAndRemoveNullsKeepsOrder) {
