@@ -196,6 +196,9 @@ OxMsg::OxMsg(const char* messageFileName, const char* msgDirectory, const char* 
     }
     delete[] name;
 
+    // A start that failed at its log file keeps its name until shutdown; a
+    // new start before that replaces it.
+    delete[] msgFileName;
     msgFileName = OxString::dup(opened.c_str());
     if (msgTable == nullptr) {
         msgTable = new OxMsgTable(msgList);
