@@ -8,7 +8,7 @@
 // process, destroying it stops it. Before a start, logging does nothing.
 //
 //   OxMsg msg("oxbase.msg", "/opt/app/data", "run.log", nullptr);
-//   OxMsg::Log(1, "part.xml");
+//   OxMsg::Log(OxMsgFileOpen, "part.xml");   // numbers: OxMsgNumbers.h
 //   if (OxMsg::getErrorCode() >= OxErrorError) return 1;
 #ifndef OXBASE_DIAG_OXMSG_H
 #define OXBASE_DIAG_OXMSG_H

@@ -2,6 +2,7 @@
 
 #include "oxbase/core/OxString.h"
 #include "oxbase/diag/OxMsg.h"
+#include "oxbase/diag/OxMsgNumbers.h"
 #include "oxbase/diag/OxPrt.h"
 #include "oxbase/doc/OxXmlAttribute.h"
 #include "oxbase/doc/OxXmlElement.h"
@@ -128,7 +129,7 @@ OxBool OxCsvFile::readFile() {
         return OxFalse;
     }
     if (input->seek(0, 0) != OxTrue) {
-        OxMsg::Log(3, nameOf(input));
+        OxMsg::Log(OxMsgFileShortRead, nameOf(input));
         return OxFalse;
     }
     // The buffer holds the longest line the file can have, so that no line is
@@ -163,7 +164,7 @@ OxBool OxCsvFile::readFile() {
     }
     delete[] line;
     if (input->eof() != OxTrue) {
-        OxMsg::Log(2, nameOf(input));
+        OxMsg::Log(OxMsgFileRead, nameOf(input));
         return OxFalse;
     }
     return OxTrue;
@@ -233,7 +234,7 @@ OxBool OxCsvFile::writeFile() {
         return OxFalse;
     }
     if (output->seek(0, 0) != OxTrue) {
-        OxMsg::Log(3, nameOf(output));
+        OxMsg::Log(OxMsgFileShortRead, nameOf(output));
         return OxFalse;
     }
     std::string text;
@@ -294,7 +295,7 @@ OxBool OxCsvFile::writeFile() {
     // unread; the stream stays failed after a failed line, so one flush at
     // the end tells whether the whole table reached the file.
     OxBool flushed = output->flush();
-    OxMsg::LogForce(578, nameOf(output));
+    OxMsg::LogForce(OxMsgCsvWritten, nameOf(output));
     return flushed;
 }
 

@@ -2,6 +2,7 @@
 
 #include "oxbase/core/OxString.h"
 #include "oxbase/diag/OxMsg.h"
+#include "oxbase/diag/OxMsgNumbers.h"
 #include "oxbase/io/OxInput.h"
 #include "oxbase/io/OxOutput.h"
 
@@ -52,18 +53,6 @@ short OxXmlFile::curpos = 0;
 char OxXmlFile::indent[21] = {};
 
 namespace {
-// Message numbers of the reader and writer.
-constexpr unsigned int kMsgReadError = 2;
-constexpr unsigned int kMsgSeekError = 3;
-constexpr unsigned int kMsgNoQuote = 560;
-constexpr unsigned int kMsgNoDeclaration = 561;
-constexpr unsigned int kMsgDeclarationInside = 562;
-constexpr unsigned int kMsgBadTagEnd = 564;
-constexpr unsigned int kMsgErrorPlace = 566;
-constexpr unsigned int kMsgEndTagMismatch = 567;
-constexpr unsigned int kMsgSecondTopLevel = 568;
-constexpr unsigned int kMsgNulBytes = 569;
-constexpr unsigned int kMsgWritten = 579;
 
 constexpr short kMaxIndent = 20;
 
@@ -462,7 +451,7 @@ OxBool OxXmlReader::run() {
             nuls++;
         }
         if (nuls > 0) {
-            OxMsg::Log(kMsgNulBytes, fileName(), lineNumber, nuls);
+            OxMsg::Log(OxMsgXmlNulBytes, fileName(), lineNumber, nuls);
         }
         char* begin = line;
         char* end = line + length;
@@ -484,7 +473,7 @@ OxBool OxXmlReader::run() {
             outcome = step();
         }
         if (outcome > 0) {
-            OxMsg::Log(kMsgErrorPlace, fileName(), lineNumber, offsetOf(cursor), lineText);
+            OxMsg::Log(OxMsgXmlErrorPlace, fileName(), lineNumber, offsetOf(cursor), lineText);
             OxMsg::Log(static_cast<unsigned int>(outcome));
             result = OxFalse;
             break;
@@ -525,7 +514,7 @@ int OxXmlReader::step() {
 int OxXmlReader::doStart() {
     char* open = find(cursor, '<');
     if (open == nullptr || !file.isDeclaration(open)) {
-        return kMsgNoDeclaration;
+        return OxMsgXmlNoDeclaration;
     }
     cursor = open;
     OxXmlElement* node =
@@ -549,7 +538,7 @@ int OxXmlReader::doContent() {
     }
     cursor = open;
     if (file.isDeclaration(cursor)) {
-        return kMsgDeclarationInside;
+        return OxMsgXmlInnerDeclaration;
     }
     if (file.isComment(cursor)) {
         state = COMMENT;
@@ -583,7 +572,7 @@ int OxXmlReader::doContent() {
     if (*nameEnd == '/') {
         cursor = nameEnd;
         if (nameEnd[1] != '>') {
-            return kMsgBadTagEnd;
+            return OxMsgXmlBadTagEnd;
         }
         createElement(open, nameBegin, nameEnd, false);
         cursor = nameEnd + 1;
@@ -611,7 +600,7 @@ int OxXmlReader::doElementValue() {
     }
     cursor = valueEnd;
     if (open == nullptr || open[1] != '/') {
-        return kMsgBadTagEnd;
+        return OxMsgXmlBadTagEnd;
     }
     closeByEndTag(open, open + 2);
     char* close = find(open + 2, '>');
@@ -635,7 +624,7 @@ int OxXmlReader::doAttribute() {
     switch (*cursor) {
     case '/':
         if (cursor[1] != '>') {
-            return kMsgBadTagEnd;
+            return OxMsgXmlBadTagEnd;
         }
         if (current != nullptr) {
             current = current->getParent();
@@ -670,7 +659,7 @@ int OxXmlReader::doAttributeValue() {
         return kGoOn;
     }
     if (*cursor != '"' && *cursor != '\'') {
-        return kMsgNoQuote;
+        return OxMsgXmlNoQuote;
     }
     quote = *cursor++;
     char* close = find(cursor, quote);
@@ -792,7 +781,7 @@ void OxXmlReader::createElement(char* tagStart, char* nameBegin, char* nameEnd, 
     } else {
         // A second element at top level has no parent to go to: it is kept
         // behind the root, where the writer writes it back.
-        OxMsg::Log(kMsgSecondTopLevel, fileName(), lineNumber, offsetOf(tagStart),
+        OxMsg::Log(OxMsgXmlSecondTopLevel, fileName(), lineNumber, offsetOf(tagStart),
                    nameOrEmpty(element->getName()));
         file.postRootNodes.append(element);
     }
@@ -813,7 +802,7 @@ void OxXmlReader::closeByEndTag(char* tagStart, char* nameBegin) {
     size_t length = static_cast<size_t>(nameEnd - nameBegin);
     if (std::strlen(openName) != length || std::strncmp(openName, nameBegin, length) != 0) {
         withText(nameBegin, nameEnd, [this, openName, tagStart](char const* endName) {
-            OxMsg::Log(kMsgEndTagMismatch, fileName(), lineNumber, offsetOf(tagStart), endName,
+            OxMsg::Log(OxMsgXmlEndTagMismatch, fileName(), lineNumber, offsetOf(tagStart), endName,
                        openName);
         });
     }
@@ -932,13 +921,13 @@ OxBool OxXmlFile::readFile() {
         return OxFalse;
     }
     if (!input->seek(0, 0)) {
-        OxMsg::Log(kMsgSeekError, nameOrEmpty(input->getFilename()));
+        OxMsg::Log(OxMsgFileShortRead, nameOrEmpty(input->getFilename()));
         return OxFalse;
     }
     oxdetail::OxXmlReader reader(*this);
     OxBool result = reader.run();
     if (result && !input->isGood() && !input->eof()) {
-        OxMsg::Log(kMsgReadError, nameOrEmpty(input->getFilename()));
+        OxMsg::Log(OxMsgFileRead, nameOrEmpty(input->getFilename()));
         return OxFalse;
     }
     return result;
@@ -973,7 +962,7 @@ OxBool OxXmlFile::writeFile() {
         return OxFalse;
     }
     if (!output->seek(0, 0)) {
-        OxMsg::Log(kMsgSeekError, nameOrEmpty(output->getFilename()));
+        OxMsg::Log(OxMsgFileShortRead, nameOrEmpty(output->getFilename()));
         return OxFalse;
     }
     if (declaration != nullptr) {
@@ -1014,7 +1003,7 @@ OxBool OxXmlFile::writeFile() {
     if (output->flush() != OxTrue) {
         result = OxFalse;
     }
-    OxMsg::Log(kMsgWritten, nameOrEmpty(output->getFilename()));
+    OxMsg::Log(OxMsgXmlWritten, nameOrEmpty(output->getFilename()));
     return result;
 }
 

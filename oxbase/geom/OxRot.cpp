@@ -1,6 +1,7 @@
 #include "oxbase/geom/OxRot.h"
 
 #include "oxbase/diag/OxMsg.h"
+#include "oxbase/diag/OxMsgNumbers.h"
 #include "oxbase/geom/OxGeomDetail.h"
 #include "oxbase/geom/OxLimits.h"
 #include "oxbase/io/OxInput.h"
@@ -18,7 +19,6 @@ using oxdetail::scaleMatrix;
 using oxdetail::setIdentity;
 
 constexpr double kFixedTolerance = 1e-5;
-constexpr int kSingularMatrix = 169;
 
 template <int N> bool exactIdentity(double const (&m)[N][N]) {
     for (int i = 0; i < N; i++) {
@@ -285,7 +285,7 @@ OxErrorCode OxRot::invert() {
         }
         double divisor = work.m[i][i];
         if (divisor == 0.0) {
-            OxMsg::Log(kSingularMatrix);
+            OxMsg::Log(OxMsgMatrixSingular);
             return OxErrorError;
         }
         for (int j = 0; j < 3; j++) {

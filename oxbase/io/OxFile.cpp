@@ -2,6 +2,7 @@
 
 #include "oxbase/core/OxString.h"
 #include "oxbase/diag/OxMsg.h"
+#include "oxbase/diag/OxMsgNumbers.h"
 #include "oxbase/platform/OxPlatformFs.h"
 
 #include <cctype>
@@ -157,7 +158,7 @@ char* OxFile::getAbsolutePath(const char* path) {
     if (getCWD(buffer, kCwdLimit, drive) == nullptr) {
         int error = OxPlatformErrno();
         delete[] buffer;
-        OxMsg::Log(484, systemErrorText(error).c_str());
+        OxMsg::Log(OxMsgCwdUnreadable, systemErrorText(error).c_str());
         return nullptr;
     }
     std::string absolute = buffer;
@@ -331,7 +332,7 @@ OxBool OxFile::mkdir(const char* path) {
         if (OxPlatformIsDirectoryMode(status)) {
             return OxTrue;
         }
-        OxMsg::Log(181, path);
+        OxMsg::Log(OxMsgNotADirectory, path);
         return OxFalse;
     }
     if (OxPlatformErrno() != kErrorNoEntry) {
@@ -341,7 +342,7 @@ OxBool OxFile::mkdir(const char* path) {
         return OxTrue;
     }
     int error = OxPlatformErrno();
-    OxMsg::Log(180, path);
+    OxMsg::Log(OxMsgDirectoryCreate, path);
     OxPlatformSetErrno(error); // logging may have touched errno
     OxPlatformPerror("System Error");
     return OxFalse;
@@ -355,7 +356,7 @@ OxBool OxFile::removeFile(const char* path) {
         return OxTrue;
     }
     int error = OxPlatformErrno();
-    OxMsg::Log(344, path, systemErrorText(error).c_str());
+    OxMsg::Log(OxMsgFileRemove, path, systemErrorText(error).c_str());
     return OxFalse;
 }
 
@@ -371,7 +372,7 @@ char* OxFile::getCWD(char* buffer, unsigned int size, unsigned int drive) {
         return buffer;
     }
     int error = OxPlatformErrno();
-    OxMsg::Log(484, systemErrorText(error).c_str());
+    OxMsg::Log(OxMsgCwdUnreadable, systemErrorText(error).c_str());
     if (allocated) {
         delete[] buffer;
     }
@@ -399,12 +400,12 @@ char* OxFile::findFile(const char* name, const OxGList<char*>& directories) {
 
 void OxFile::logStreamState(std::ios_base::iostate state) {
     if ((state & std::ios_base::eofbit) != 0) {
-        OxMsg::Log(18);
+        OxMsg::Log(OxMsgStreamEnd);
     }
     if ((state & std::ios_base::failbit) != 0) {
-        OxMsg::Log(19);
+        OxMsg::Log(OxMsgStreamFailed);
     }
     if ((state & std::ios_base::badbit) != 0) {
-        OxMsg::Log(20);
+        OxMsg::Log(OxMsgStreamBad);
     }
 }

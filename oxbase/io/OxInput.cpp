@@ -1,6 +1,7 @@
 #include "oxbase/io/OxInput.h"
 
 #include "oxbase/diag/OxMsg.h"
+#include "oxbase/diag/OxMsgNumbers.h"
 #include "oxbase/diag/OxPrt.h"
 #include "oxbase/io/OxByteOrder.h"
 #include "oxbase/platform/OxPlatformFs.h"
@@ -44,7 +45,7 @@ OxInput::OxInput(const char* name, OxFile::FILE_MODE mode)
     const char* text = filename != nullptr ? filename : "";
     stream = OxPlatformOpenInput(text, mode == FILE_MODE_BINARY);
     if (!stream->good()) {
-        OxMsg::Log(1, text);
+        OxMsg::Log(OxMsgFileOpen, text);
         readState();
         delete stream;
         stream = nullptr;
@@ -53,13 +54,13 @@ OxInput::OxInput(const char* name, OxFile::FILE_MODE mode)
     std::streambuf* buffer = stream->rdbuf();
     std::streampos end = buffer->pubseekoff(0, std::ios_base::end, std::ios_base::in);
     if (end == std::streampos(std::streamoff(-1))) {
-        OxMsg::Log(3, text);
+        OxMsg::Log(OxMsgFileShortRead, text);
         return;
     }
     fileLength = static_cast<long long>(std::streamoff(end));
     if (buffer->pubseekoff(0, std::ios_base::beg, std::ios_base::in) ==
         std::streampos(std::streamoff(-1))) {
-        OxMsg::Log(3, text);
+        OxMsg::Log(OxMsgFileShortRead, text);
     }
 }
 
@@ -74,11 +75,11 @@ bool OxInput::readValueBytes(unsigned char* bytes, unsigned int size, long long&
     const char* text = filename != nullptr ? filename : "";
     result = 0;
     if (stream == nullptr) {
-        OxMsg::Log(2, text);
+        OxMsg::Log(OxMsgFileRead, text);
         return false;
     }
     if (!stream->good()) {
-        OxMsg::Log(2, text);
+        OxMsg::Log(OxMsgFileRead, text);
         readState();
         return false;
     }
@@ -88,7 +89,7 @@ bool OxInput::readValueBytes(unsigned char* bytes, unsigned int size, long long&
         stream->rdbuf()->sgetn(reinterpret_cast<char*>(bytes), static_cast<std::streamsize>(size)));
     if (delivered != static_cast<long long>(size)) {
         stream->setstate(std::ios_base::eofbit | std::ios_base::failbit);
-        OxMsg::Log(2, text);
+        OxMsg::Log(OxMsgFileRead, text);
         readState();
         result = delivered;
         return false;
@@ -148,18 +149,18 @@ long long OxInput::read(long long& value) {
 long long OxInput::read(char* buffer, unsigned int length) {
     const char* text = filename != nullptr ? filename : "";
     if (stream == nullptr || (buffer == nullptr && length != 0)) {
-        OxMsg::Log(2, text);
+        OxMsg::Log(OxMsgFileRead, text);
         return 0;
     }
     stream->read(buffer, static_cast<std::streamsize>(length));
     long long delivered = static_cast<long long>(stream->gcount());
     if (!stream->good()) {
-        OxMsg::Log(2, text);
+        OxMsg::Log(OxMsgFileRead, text);
         readState();
         return 0;
     }
     if (delivered != static_cast<long long>(length)) {
-        OxMsg::Log(3, text);
+        OxMsg::Log(OxMsgFileShortRead, text);
         return delivered;
     }
     return length;
@@ -172,7 +173,7 @@ long long OxInput::read(unsigned char* buffer, unsigned int length) {
 long long OxInput::readUStoC(char* buffer, unsigned int count, unsigned int& stored) {
     stored = 0;
     if (buffer == nullptr && count != 0) {
-        OxMsg::Log(2, filename != nullptr ? filename : "");
+        OxMsg::Log(OxMsgFileRead, filename != nullptr ? filename : "");
         return 0;
     }
     if (count == 0) {
@@ -193,7 +194,7 @@ long long OxInput::readUStoC(char* buffer, unsigned int count, unsigned int& sto
 long long OxInput::readDECUStoC(char* buffer, unsigned int count, unsigned int& stored) {
     stored = 0;
     if (buffer == nullptr && count != 0) {
-        OxMsg::Log(2, filename != nullptr ? filename : "");
+        OxMsg::Log(OxMsgFileRead, filename != nullptr ? filename : "");
         return 0;
     }
     unsigned int units = (count + 1u) >> 1;
@@ -215,7 +216,7 @@ long long OxInput::readDECUStoC(char* buffer, unsigned int count, unsigned int& 
 
 OxBool OxInput::getline(char* buffer, unsigned int size, char delimiter) {
     if (stream == nullptr || buffer == nullptr) {
-        OxMsg::Log(2, filename != nullptr ? filename : "");
+        OxMsg::Log(OxMsgFileRead, filename != nullptr ? filename : "");
         return OxFalse;
     }
     stream->getline(buffer, static_cast<std::streamsize>(size), delimiter);
@@ -247,7 +248,7 @@ OxBool OxInput::seek(int offset, unsigned int direction) {
     bool valid;
     std::ios_base::seekdir way = seekDirection(direction, valid);
     if (!valid) {
-        OxMsg::Log(3, filename != nullptr ? filename : "");
+        OxMsg::Log(OxMsgFileShortRead, filename != nullptr ? filename : "");
         return OxFalse;
     }
     std::streampos position =
@@ -260,7 +261,7 @@ OxBool OxInput::hexDump(std::ostrstream* out) {
         return OxFalse;
     }
     if (seek(0, 0) != OxTrue) {
-        OxMsg::Log(3, filename != nullptr ? filename : "");
+        OxMsg::Log(OxMsgFileShortRead, filename != nullptr ? filename : "");
         return OxFalse;
     }
     *out << "OxInput (Binary File):" << '\n';

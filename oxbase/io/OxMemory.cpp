@@ -1,6 +1,7 @@
 #include "oxbase/io/OxMemory.h"
 
 #include "oxbase/diag/OxMsg.h"
+#include "oxbase/diag/OxMsgNumbers.h"
 #include "oxbase/io/OxByteOrder.h"
 #include "oxbase/io/OxInput.h"
 
@@ -17,7 +18,7 @@ bool OxMemory::fits(size_t size) const {
     // Strictly below the length: the last byte is never handed out.
     size_t offset = static_cast<size_t>(current - buffer);
     if (buffer == nullptr || offset >= length || size >= length - offset) {
-        OxMsg::Log(147);
+        OxMsg::Log(OxMsgMemoryPastEnd);
         return false;
     }
     return true;
@@ -82,7 +83,7 @@ int OxMemory::read(unsigned char* target, unsigned int count) {
     }
     if (count != 0) {
         if (target == nullptr) {
-            OxMsg::Log(147);
+            OxMsg::Log(OxMsgMemoryPastEnd);
             return 0;
         }
         std::memcpy(target, current, count);
@@ -100,12 +101,12 @@ OxBool OxMemory::seek(size_t offset, OxMemory::DIR direction) {
         std::uint64_t target = now + static_cast<std::uint64_t>(offset);
         if (static_cast<std::int64_t>(target) < 0) {
             current = buffer;
-            OxMsg::Log(152);
+            OxMsg::Log(OxMsgMemoryBeforeStart);
             return OxFalse;
         }
         if (target >= length) {
             current = last;
-            OxMsg::Log(153);
+            OxMsg::Log(OxMsgMemoryBeyondEnd);
             return OxFalse;
         }
         current = buffer + target;
@@ -114,7 +115,7 @@ OxBool OxMemory::seek(size_t offset, OxMemory::DIR direction) {
     if (direction == DIR_BEGIN) {
         if (offset > length) {
             current = last;
-            OxMsg::Log(153);
+            OxMsg::Log(OxMsgMemoryBeyondEnd);
             return OxFalse;
         }
         current = buffer + offset;

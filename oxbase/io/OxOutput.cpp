@@ -1,6 +1,7 @@
 #include "oxbase/io/OxOutput.h"
 
 #include "oxbase/diag/OxMsg.h"
+#include "oxbase/diag/OxMsgNumbers.h"
 #include "oxbase/io/OxByteOrder.h"
 #include "oxbase/io/OxInput.h"
 #include "oxbase/platform/OxPlatformFs.h"
@@ -44,20 +45,20 @@ OxOutput::OxOutput(const char* name, OxFile::FILE_MODE mode) : OxFile(name), str
         if (OxPlatformStat(directory.c_str(), &status) != 0) {
             if (OxPlatformErrno() == kErrorNoEntry && OxPlatformMkdir(directory.c_str()) != 0) {
                 std::string error = OxPlatformErrorText(OxPlatformErrno());
-                OxMsg::Log(180, directory.c_str(), error.c_str());
+                OxMsg::Log(OxMsgDirectoryCreate, directory.c_str(), error.c_str());
                 return;
             }
         } else if (!OxPlatformIsDirectoryMode(status)) {
-            OxMsg::Log(181, directory.c_str());
+            OxMsg::Log(OxMsgNotADirectory, directory.c_str());
             return;
         } else if (isReplaceable(text) && OxPlatformRemove(text) != 0) {
-            OxMsg::Log(182, text);
+            OxMsg::Log(OxMsgFileRemoveExisting, text);
             return;
         }
     }
     stream = OxPlatformOpenOutput(text, mode == FILE_MODE_BINARY);
     if (!stream->good()) {
-        OxMsg::Log(1, text);
+        OxMsg::Log(OxMsgFileOpen, text);
         readState();
         delete stream;
         stream = nullptr;
@@ -71,7 +72,7 @@ OxOutput::~OxOutput() {
     bool wasGood = stream->good();
     stream->close();
     if (wasGood && !stream->good()) {
-        OxMsg::Log(183, nameText(filename));
+        OxMsg::Log(OxMsgFileClose, nameText(filename));
     }
     delete stream;
 }
@@ -99,7 +100,7 @@ OxBool OxOutput::close() {
 
 OxBool OxOutput::hasStream() const {
     if (stream == nullptr) {
-        OxMsg::Log(179, nameText(filename));
+        OxMsg::Log(OxMsgFileWrite, nameText(filename));
         return OxFalse;
     }
     return OxTrue;
@@ -107,7 +108,7 @@ OxBool OxOutput::hasStream() const {
 
 OxBool OxOutput::checkState() const {
     if (!stream->good()) {
-        OxMsg::Log(179, nameText(filename));
+        OxMsg::Log(OxMsgFileWrite, nameText(filename));
         readState();
         return OxFalse;
     }
@@ -173,7 +174,7 @@ OxBool OxOutput::writeBlock(const char* buffer, long long length) {
         return OxFalse;
     }
     if (count < 0 || (buffer == nullptr && count != 0)) {
-        OxMsg::Log(179, nameText(filename));
+        OxMsg::Log(OxMsgFileWrite, nameText(filename));
         return OxFalse;
     }
     stream->write(buffer, static_cast<std::streamsize>(count));
@@ -240,7 +241,7 @@ OxBool OxOutput::seek(int offset, unsigned int direction) {
         way = std::ios_base::end;
         break;
     default:
-        OxMsg::Log(179, nameText(filename));
+        OxMsg::Log(OxMsgFileWrite, nameText(filename));
         return OxFalse;
     }
     std::streampos position = stream->rdbuf()->pubseekoff(offset, way, std::ios_base::out);

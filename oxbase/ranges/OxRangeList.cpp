@@ -3,6 +3,7 @@
 
 #include "oxbase/core/OxString.h"
 #include "oxbase/diag/OxMsg.h"
+#include "oxbase/diag/OxMsgNumbers.h"
 
 #include <algorithm>
 #include <cctype>
@@ -11,10 +12,6 @@
 #include <vector>
 
 namespace {
-
-constexpr unsigned int msgNoMemory = 228;
-constexpr unsigned int msgSyntax = 293;
-constexpr unsigned int msgBackwards = 294;
 
 char const* const recordTypeName = "OxRangeListRecord";
 
@@ -120,18 +117,18 @@ OxBool OxRangeList::build(char const* text, char const* typeName) {
     bool failed = false;
 
     auto syntaxError = [&](unsigned int at) {
-        OxMsg::Log(msgSyntax, typeName, at + 1, copy);
+        OxMsg::Log(OxMsgRangeSyntax, typeName, at + 1, copy);
         failed = true;
     };
     // Stores first..last; false (after the message) when it cannot be.
     auto store = [&]() {
         auto* record = new (std::nothrow) OxRangeListRecord;
         if (record == nullptr) {
-            OxMsg::Log(msgNoMemory, recordTypeName);
+            OxMsg::Log(OxMsgNoMemory, recordTypeName);
             return false;
         }
         if (last < first) {
-            OxMsg::Log(msgBackwards, typeName, first, last);
+            OxMsg::Log(OxMsgRangeBackwards, typeName, first, last);
             delete record;
             return false;
         }
@@ -325,7 +322,7 @@ OxBool OxRangeList::negate(unsigned int from, unsigned int to) {
         }
     }
     if (failed) {
-        OxMsg::Log(msgNoMemory, recordTypeName);
+        OxMsg::Log(OxMsgNoMemory, recordTypeName);
         for (OxRangeListRecord* record : pieces) {
             delete record;
         }
