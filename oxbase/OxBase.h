@@ -26,10 +26,10 @@
 #include "oxbase/diag/OxFlavor.h"
 #include "oxbase/diag/OxHeapInfo.h"
 #include "oxbase/diag/OxMsg.h"
+#include "oxbase/diag/OxMsgNumbers.h"
 #include "oxbase/diag/OxPrt.h"
 
 // Files and streams
-#include "oxbase/io/OxDirStream.h"
 #include "oxbase/io/OxFile.h"
 #include "oxbase/io/OxFileList.h"
 #include "oxbase/io/OxFileTreeWalk.h"
@@ -58,5 +58,12 @@
 
 // Ranges
 #include "oxbase/ranges/OxRangeList.h"
+
+// Platform types of the interface: the file status record, heap walks,
+// compiler annotations and the string streams of the print objects
+#include "oxbase/platform/OxCompiler.h"
+#include "oxbase/platform/OxHeapWalk.h"
+#include "oxbase/platform/OxStat.h"
+#include "oxbase/platform/OxStrstream.h"
 
 #endif

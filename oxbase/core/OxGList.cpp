@@ -2,10 +2,12 @@
 
 #include <iostream>
 
-namespace oxdetail {
+namespace oxbase {
+namespace detail {
 void reportListRange(unsigned int index, unsigned int length) {
     std::cout << "Ooops, trying to access element " << index << " in OxList of length " << length
               << "\n"
               << std::flush;
 }
-} // namespace oxdetail
+} // namespace detail
+} // namespace oxbase

@@ -14,10 +14,12 @@
 
 #include <cstdio>
 
-namespace oxdetail {
+namespace oxbase {
+namespace detail {
 /// Writes the out-of-range report of an element access to standard output.
 void reportListRange(unsigned int index, unsigned int length);
-} // namespace oxdetail
+} // namespace detail
+} // namespace oxbase
 
 /// Growable array with capacity 0 or a power of two and indices from 0.
 ///
@@ -182,7 +184,7 @@ private:
 
     void checkRange(unsigned int index) const {
         if (index > length) {
-            oxdetail::reportListRange(index, length);
+            oxbase::detail::reportListRange(index, length);
         }
     }
 

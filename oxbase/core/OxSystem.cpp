@@ -1,11 +1,13 @@
 #include "oxbase/core/OxSystem.h"
 
 #include "oxbase/diag/OxPrt.h"
-#include "oxbase/platform/OxPlatformSystem.h"
+#include "oxbase/platform/detail/OxPlatformSystem.h"
 
 #include <algorithm>
 #include <cstdarg>
 #include <cstring>
+
+using namespace oxbase::detail;
 
 char OxSystem::asctime_buffer[49] = {};
 char OxSystem::ctime_buffer[27] = {};

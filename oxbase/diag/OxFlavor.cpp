@@ -96,7 +96,7 @@ std::ostrstream* OxFlavor::dump(std::ostrstream* stream) const {
         } else if (number > entries.getLength()) {
             // The list's own report of an access beyond its end; the slot
             // itself is not touched.
-            oxdetail::reportListRange(number, entries.getLength());
+            oxbase::detail::reportListRange(number, entries.getLength());
         }
         *stream << "  " << (name != nullptr ? name : OxString::str_null) << "\n";
     }

@@ -1,9 +1,12 @@
 #include "oxbase/diag/OxHeapInfo.h"
 
 #include "oxbase/diag/OxPrt.h"
+#include "oxbase/platform/detail/OxPlatformHeap.h"
 
 #include <cstdint>
 #include <new>
+
+using namespace oxbase::detail;
 
 namespace {
 std::uintptr_t addressOf(const OxHeapInfo::HeapEntry& entry) {
@@ -36,8 +39,8 @@ void OxHeapInfo::release() {
 
 void OxHeapInfo::snap() {
     release();
-    OxPlatformHeapEntry counting;
-    while (OxPlatformHeapWalk(&counting) == OxPlatformHeapOk) {
+    OxHeapWalkEntry counting;
+    while (OxPlatformHeapWalk(&counting) == OxHeapWalkOk) {
         count++;
         if (counting.used != 0) {
             usedCount++;
@@ -52,8 +55,8 @@ void OxHeapInfo::snap() {
         return;
     }
     unsigned int filled = 0;
-    OxPlatformHeapEntry filling;
-    while (OxPlatformHeapWalk(&filling) == OxPlatformHeapOk) {
+    OxHeapWalkEntry filling;
+    while (OxPlatformHeapWalk(&filling) == OxHeapWalkOk) {
         if (filling.used != 0) {
             usedBytes += filling.size;
         }

@@ -11,7 +11,7 @@
 //   OxHeapInfo * fresh = after.diff(before);
 //   OxPrt prt;  fresh->memusage(prt, OxHeapInfo::MEMUSAGE_HEADS);  delete fresh;
 //
-// The blocks come from the heap walk of oxbase/platform/OxPlatformHeap.h:
+// The blocks come from the heap walk of oxbase/platform/detail/OxPlatformHeap.h:
 // the runtime's _heapwalk on Windows, a validating walker of glibc's main
 // arena on Linux (brk heap only: mmap'ed blocks and other threads' arenas
 // are not seen; cached and fastbin blocks count as used; the top chunk is
@@ -25,7 +25,7 @@
 #define OXBASE_DIAG_OXHEAPINFO_H
 
 #include "oxbase/core/OxTypes.h"
-#include "oxbase/platform/OxPlatformHeap.h"
+#include "oxbase/platform/OxHeapWalk.h"
 
 #include <cstddef>
 
@@ -48,7 +48,7 @@ public:
     };
 
     /// A source of blocks, as OxPlatformHeapWalk takes it.
-    using WalkFunction = OxPlatformHeapWalkFunction;
+    using WalkFunction = OxHeapWalkFunction;
 
     /// No picture; every count 0.
     OxHeapInfo();

@@ -1,9 +1,9 @@
 #include "oxbase/diag/OxMsg.h"
 
 #include "oxbase/core/OxString.h"
-#include "oxbase/diag/OxMsgTable.h"
-#include "oxbase/platform/OxPlatformFs.h"
-#include "oxbase/platform/OxPlatformPath.h"
+#include "oxbase/diag/detail/OxMsgTable.h"
+#include "oxbase/platform/detail/OxPlatformFs.h"
+#include "oxbase/platform/detail/OxPlatformPath.h"
 
 #include <cstdio>
 #include <cstring>
@@ -11,6 +11,8 @@
 #include <iostream>
 #include <new>
 #include <string>
+
+using namespace oxbase::detail;
 
 // All state is process-wide. The message list itself is defined with the other
 // ordered statics in oxbase/core/OxStatics.cpp.
@@ -23,7 +25,7 @@ char* OxMsg::buf = nullptr;
 int OxMsg::buflen = 0;
 std::ifstream* OxMsg::msgFile = nullptr;
 std::ofstream* OxMsg::logFile = nullptr;
-OxMsgTable* OxMsg::msgTable = nullptr;
+oxbase::detail::OxMsgTable* OxMsg::msgTable = nullptr;
 char* OxMsg::msgFileName = nullptr;
 char* OxMsg::logFileName = nullptr;
 OxMsg::Callback OxMsg::pMsgCallback = nullptr;

@@ -19,7 +19,11 @@
 #include <cstdarg>
 #include <fstream>
 
+namespace oxbase {
+namespace detail {
 class OxMsgTable;
+} // namespace detail
+} // namespace oxbase
 
 enum OxMsgType : std::uint32_t {
     OxMsgTypeUnknown = 0,
@@ -107,7 +111,7 @@ private:
     static std::ofstream* logFile;
     /// The records by number: texts at their size and an index searched by
     /// halving (see OxMsgTable). It owns the records of msgList.
-    static OxMsgTable* msgTable;
+    static oxbase::detail::OxMsgTable* msgTable;
     static OxGList<OxMsgRecord_s*> msgList; // defined in oxbase/core/OxStatics.cpp
     static char* msgFileName;
     static char* logFileName;

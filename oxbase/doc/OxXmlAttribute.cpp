@@ -1,15 +1,17 @@
 #include "oxbase/doc/OxXmlAttribute.h"
 
-#include "oxbase/core/OxSlabPool.h"
 #include "oxbase/core/OxString.h"
+#include "oxbase/core/detail/OxSlabPool.h"
 #include "oxbase/diag/OxPrt.h"
-#include "oxbase/doc/OxXmlNames.h"
+#include "oxbase/doc/detail/OxXmlNames.h"
 #include "oxbase/geom/OxColor.h"
 #include "oxbase/geom/OxRot.h"
 #include "oxbase/geom/OxVec.h"
 
 #include <cmath>
 #include <iomanip>
+
+using namespace oxbase::detail;
 
 namespace {
 /// A trimmed copy of `text`: null for null or empty input.

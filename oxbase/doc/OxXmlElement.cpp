@@ -1,11 +1,11 @@
 #include "oxbase/doc/OxXmlElement.h"
 
-#include "oxbase/core/OxSlabPool.h"
 #include "oxbase/core/OxString.h"
 #include "oxbase/core/OxSystem.h"
+#include "oxbase/core/detail/OxSlabPool.h"
 #include "oxbase/diag/OxPrt.h"
 #include "oxbase/doc/OxXmlFile.h"
-#include "oxbase/doc/OxXmlNames.h"
+#include "oxbase/doc/detail/OxXmlNames.h"
 #include "oxbase/geom/OxColor.h"
 #include "oxbase/geom/OxVec.h"
 
@@ -13,6 +13,8 @@
 #include <cstring>
 #include <new>
 #include <typeinfo>
+
+using namespace oxbase::detail;
 
 namespace {
 /// A trimmed copy of `text`: null for null or empty input.

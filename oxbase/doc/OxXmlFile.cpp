@@ -206,7 +206,8 @@ private:
 };
 } // namespace
 
-namespace oxdetail {
+namespace oxbase {
+namespace detail {
 
 /// The lines of a text-mode input, whole, whatever their length.
 ///
@@ -854,7 +855,8 @@ void OxXmlReader::finish() {
     }
 }
 
-} // namespace oxdetail
+} // namespace detail
+} // namespace oxbase
 
 // ---------------------------------------------------------------------------
 // The document
@@ -924,7 +926,7 @@ OxBool OxXmlFile::readFile() {
         OxMsg::Log(OxMsgFileShortRead, nameOrEmpty(input->getFilename()));
         return OxFalse;
     }
-    oxdetail::OxXmlReader reader(*this);
+    oxbase::detail::OxXmlReader reader(*this);
     OxBool result = reader.run();
     if (result && !input->isGood() && !input->eof()) {
         OxMsg::Log(OxMsgFileRead, nameOrEmpty(input->getFilename()));

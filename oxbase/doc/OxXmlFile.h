@@ -23,9 +23,11 @@
 class OxInput;
 class OxOutput;
 
-namespace oxdetail {
+namespace oxbase {
+namespace detail {
 class OxXmlReader;
-}
+} // namespace detail
+} // namespace oxbase
 
 class OxXmlFile {
 public:
@@ -124,7 +126,7 @@ public:
     std::ostrstream* dumpXML(std::ostrstream* stream) const;
 
 private:
-    friend class oxdetail::OxXmlReader;
+    friend class oxbase::detail::OxXmlReader;
 
     OxBool isDeclaration(char const* text);
     OxBool isComment(char const* text);

@@ -1,7 +1,7 @@
 #include "oxbase/geom/OxBBox.h"
 
-#include "oxbase/geom/OxGeomDetail.h"
 #include "oxbase/geom/OxVec.h"
+#include "oxbase/geom/detail/OxGeomDetail.h"
 
 #include <array>
 #include <cmath>
@@ -9,12 +9,14 @@
 #include <iomanip>
 #include <limits>
 
+using namespace oxbase::detail;
+
 // The three classes differ in precision and in their number of axes; the
 // helpers below work on the fields as an array of pointers in field order,
 // the lower fields in the first half and the upper ones in the second.
 namespace {
 constexpr double kFixedTolerance = 1e-5;
-using oxdetail::copyFields;
+using oxbase::detail::copyFields;
 
 template <class T, std::size_t K> void setEmptyMarkers(const std::array<T*, K>& fields) {
     for (std::size_t i = 0; i < K; i++) {
@@ -190,11 +192,11 @@ OxBBoxf& OxBBoxf::operator+=(const OxBBoxf& other) {
 
 long long OxBBoxf::readValue(OxInput& input, float scale) {
     empty = OxFalse;
-    return oxdetail::readScaledFields(input, fields(*this), scale);
+    return oxbase::detail::readScaledFields(input, fields(*this), scale);
 }
 
 long long OxBBoxf::writeValue(OxOutput& output, float scale) {
-    return oxdetail::writeFields(output, fields(*this), oxdetail::Scaled{scale});
+    return oxbase::detail::writeFields(output, fields(*this), oxbase::detail::Scaled{scale});
 }
 
 std::ostrstream* OxBBoxf::dump(std::ostrstream* stream) const {
@@ -277,11 +279,11 @@ OxBBox& OxBBox::operator+=(const OxBBox& other) {
 
 long long OxBBox::readValue(OxInput& input) {
     empty = OxFalse;
-    return oxdetail::readFields(input, fields(*this));
+    return oxbase::detail::readFields(input, fields(*this));
 }
 
 long long OxBBox::writeValue(OxOutput& output) {
-    return oxdetail::writeFields(output, fields(*this), oxdetail::Unscaled());
+    return oxbase::detail::writeFields(output, fields(*this), oxbase::detail::Unscaled());
 }
 
 std::ostrstream* OxBBox::dump(std::ostrstream* stream) const {
@@ -338,11 +340,11 @@ OxBRect& OxBRect::operator+=(const OxBRect& other) {
 
 long long OxBRect::readValue(OxInput& input) {
     empty = OxFalse;
-    return oxdetail::readFields(input, fields(*this));
+    return oxbase::detail::readFields(input, fields(*this));
 }
 
 long long OxBRect::writeValue(OxOutput& output) {
-    return oxdetail::writeFields(output, fields(*this), oxdetail::Unscaled());
+    return oxbase::detail::writeFields(output, fields(*this), oxbase::detail::Unscaled());
 }
 
 std::ostrstream* OxBRect::dump(std::ostrstream* stream) const {

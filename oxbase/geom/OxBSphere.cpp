@@ -1,10 +1,12 @@
 #include "oxbase/geom/OxBSphere.h"
 
-#include "oxbase/geom/OxGeomDetail.h"
 #include "oxbase/geom/OxVec.h"
+#include "oxbase/geom/detail/OxGeomDetail.h"
 
 #include <array>
 #include <iomanip>
+
+using namespace oxbase::detail;
 
 // Both spheres are four numbers in file order; the helpers below work on
 // them as an array of pointers.
@@ -59,13 +61,13 @@ OxBSpheref::OxBSpheref(OxVec3d const& center, float radius) : OxBSpheref() {
 }
 
 const OxBSpheref& OxBSpheref::operator=(const OxBSpheref& other) {
-    oxdetail::copyFields(fields(*this), fields(other));
+    oxbase::detail::copyFields(fields(*this), fields(other));
     empty = other.empty;
     return *this;
 }
 
 const OxBSpheref& OxBSpheref::operator=(const OxBSphere& other) {
-    oxdetail::copyFields(fields(*this), OxBSphere::fields(other));
+    oxbase::detail::copyFields(fields(*this), OxBSphere::fields(other));
     empty = other.empty;
     return *this;
 }
@@ -94,11 +96,11 @@ void OxBSpheref::getValue(OxVec3d& center, float& radius) const {
 
 long long OxBSpheref::readValue(OxInput& input, float scale) {
     empty = OxFalse;
-    return oxdetail::readScaledFields(input, fields(*this), scale);
+    return oxbase::detail::readScaledFields(input, fields(*this), scale);
 }
 
 long long OxBSpheref::writeValue(OxOutput& output, float scale) {
-    return oxdetail::writeFields(output, fields(*this), oxdetail::Scaled{scale});
+    return oxbase::detail::writeFields(output, fields(*this), oxbase::detail::Scaled{scale});
 }
 
 std::ostrstream* OxBSpheref::dump(std::ostrstream* stream) const {
@@ -121,13 +123,13 @@ OxBSphere::OxBSphere(OxBSpheref other) : OxBSphere() {
 }
 
 const OxBSphere& OxBSphere::operator=(const OxBSphere& other) {
-    oxdetail::copyFields(fields(*this), fields(other));
+    oxbase::detail::copyFields(fields(*this), fields(other));
     empty = other.empty;
     return *this;
 }
 
 const OxBSphere& OxBSphere::operator=(const OxBSpheref& other) {
-    oxdetail::copyFields(fields(*this), OxBSpheref::fields(other));
+    oxbase::detail::copyFields(fields(*this), OxBSpheref::fields(other));
     empty = other.empty;
     return *this;
 }
@@ -156,11 +158,11 @@ void OxBSphere::getValue(OxVec3d& center, double& radius) const {
 
 long long OxBSphere::readValue(OxInput& input) {
     empty = OxFalse;
-    return oxdetail::readFields(input, fields(*this));
+    return oxbase::detail::readFields(input, fields(*this));
 }
 
 long long OxBSphere::writeValue(OxOutput& output) {
-    return oxdetail::writeFields(output, fields(*this), oxdetail::Unscaled());
+    return oxbase::detail::writeFields(output, fields(*this), oxbase::detail::Unscaled());
 }
 
 std::ostrstream* OxBSphere::dump(std::ostrstream* stream) const {

@@ -1,16 +1,18 @@
 #include "oxbase/geom/OxMatrix.h"
 
-#include "oxbase/geom/OxGeomDetail.h"
 #include "oxbase/geom/OxVec.h"
+#include "oxbase/geom/detail/OxGeomDetail.h"
 
 #include <iomanip>
 
+using namespace oxbase::detail;
+
 OxMatrix::OxMatrix() {
-    oxdetail::setIdentity<4>(m);
+    oxbase::detail::setIdentity<4>(m);
 }
 
 OxMatrix::OxMatrix(double const (&values)[4][4]) {
-    oxdetail::copyMatrix<4>(m, values);
+    oxbase::detail::copyMatrix<4>(m, values);
 }
 
 OxMatrix::OxMatrix(double m00, double m01, double m02, double m03, double m10, double m11,
@@ -20,7 +22,7 @@ OxMatrix::OxMatrix(double m00, double m01, double m02, double m03, double m10, d
 
 const OxMatrix& OxMatrix::operator=(const OxMatrix& other) {
     if (this != &other) {
-        oxdetail::copyMatrix<4>(m, other.m);
+        oxbase::detail::copyMatrix<4>(m, other.m);
     }
     return *this;
 }
@@ -30,29 +32,29 @@ OxMatrix OxMatrix::identity() {
 }
 
 void OxMatrix::makeIdentity() {
-    oxdetail::setIdentity<4>(m);
+    oxbase::detail::setIdentity<4>(m);
 }
 
 void OxMatrix::setValue(double const (&values)[4][4]) {
-    oxdetail::copyMatrix<4>(m, values);
+    oxbase::detail::copyMatrix<4>(m, values);
 }
 
 void OxMatrix::getValue(double (&values)[4][4]) const {
-    oxdetail::copyMatrix<4>(values, m);
+    oxbase::detail::copyMatrix<4>(values, m);
 }
 
 void OxMatrix::setScale(double s) {
     const double diagonal[4] = {s, s, s, 1.0};
-    oxdetail::scaleMatrix<4>(m, diagonal);
+    oxbase::detail::scaleMatrix<4>(m, diagonal);
 }
 
 void OxMatrix::setScale(OxVec3d const& v) {
     const double diagonal[4] = {v.x, v.y, v.z, 1.0};
-    oxdetail::scaleMatrix<4>(m, diagonal);
+    oxbase::detail::scaleMatrix<4>(m, diagonal);
 }
 
 void OxMatrix::setTranslate(OxVec3d const& v) {
-    oxdetail::setIdentity<4>(m);
+    oxbase::detail::setIdentity<4>(m);
     m[0][3] = v.x;
     m[1][3] = v.y;
     m[2][3] = v.z;

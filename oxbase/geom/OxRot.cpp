@@ -2,8 +2,8 @@
 
 #include "oxbase/diag/OxMsg.h"
 #include "oxbase/diag/OxMsgNumbers.h"
-#include "oxbase/geom/OxGeomDetail.h"
 #include "oxbase/geom/OxLimits.h"
+#include "oxbase/geom/detail/OxGeomDetail.h"
 #include "oxbase/io/OxInput.h"
 #include "oxbase/io/OxOutput.h"
 
@@ -11,12 +11,14 @@
 #include <iomanip>
 #include <utility>
 
+using namespace oxbase::detail;
+
 // OxRot and OxRot2d differ only in their dimension; the helpers below, and
 // those of OxGeomDetail.h, serve both through their row arrays.
 namespace {
-using oxdetail::copyMatrix;
-using oxdetail::scaleMatrix;
-using oxdetail::setIdentity;
+using oxbase::detail::copyMatrix;
+using oxbase::detail::scaleMatrix;
+using oxbase::detail::setIdentity;
 
 constexpr double kFixedTolerance = 1e-5;
 

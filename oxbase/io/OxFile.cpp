@@ -3,12 +3,14 @@
 #include "oxbase/core/OxString.h"
 #include "oxbase/diag/OxMsg.h"
 #include "oxbase/diag/OxMsgNumbers.h"
-#include "oxbase/platform/OxPlatformFs.h"
+#include "oxbase/platform/detail/OxPlatformFs.h"
 
 #include <cctype>
 #include <climits>
 #include <cstring>
 #include <string>
+
+using namespace oxbase::detail;
 
 namespace {
 

@@ -2,13 +2,15 @@
 #include "oxbase/io/OxFileList.h"
 
 #include "oxbase/core/OxString.h"
-#include "oxbase/platform/OxPlatformFs.h"
-#include "oxbase/platform/OxPlatformPath.h"
+#include "oxbase/platform/detail/OxPlatformFs.h"
+#include "oxbase/platform/detail/OxPlatformPath.h"
 
 #include <cctype>
 #include <cstring>
 #include <iostream>
 #include <string>
+
+using namespace oxbase::detail;
 
 namespace {
 

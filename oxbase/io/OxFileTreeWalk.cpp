@@ -1,15 +1,17 @@
 // OxFileTreeWalk.cpp: the walk, its ring of directory streams and parking.
 #include "oxbase/io/OxFileTreeWalk.h"
 
-#include "oxbase/io/OxDirStream.h"
-#include "oxbase/platform/OxPlatformDir.h"
-#include "oxbase/platform/OxPlatformPath.h"
+#include "oxbase/io/detail/OxDirStream.h"
+#include "oxbase/platform/detail/OxPlatformDir.h"
+#include "oxbase/platform/detail/OxPlatformPath.h"
 
 #include <cerrno>
 #include <cstring>
 #include <iostream>
 #include <new>
 #include <string>
+
+using namespace oxbase::detail;
 
 namespace {
 

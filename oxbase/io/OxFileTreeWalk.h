@@ -19,12 +19,16 @@
 #define OXBASE_IO_OXFILETREEWALK_H
 
 #include "oxbase/io/OxInodeTable.h"
-#include "oxbase/platform/OxPlatformFs.h"
+#include "oxbase/platform/OxStat.h"
 
 #include <cstddef>
 #include <cstdint>
 
+namespace oxbase {
+namespace detail {
 struct OxDirStream;
+} // namespace detail
+} // namespace oxbase
 
 /// What the callback is given.
 enum OxFileTreeWalkType {
@@ -45,7 +49,7 @@ public:
     /// One directory being read: its stream, or the names read ahead when the
     /// stream was parked (each ended by a zero byte, the whole by one more).
     struct FileTreeWalkDir {
-        OxDirStream* stream = nullptr;
+        oxbase::detail::OxDirStream* stream = nullptr;
         char* content = nullptr; ///< owned
     };
 

@@ -3,8 +3,11 @@
 
 #include "oxbase/core/HashTable.h"
 #include "oxbase/diag/OxPrt.h"
+#include "oxbase/platform/detail/OxPlatformFs.h"
 
 #include <iostream>
+
+using namespace oxbase::detail;
 
 namespace {
 

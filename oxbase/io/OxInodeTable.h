@@ -17,7 +17,7 @@
 
 #include "oxbase/core/OxGList.h"
 #include "oxbase/core/OxTypes.h"
-#include "oxbase/platform/OxPlatformFs.h"
+#include "oxbase/platform/OxStat.h"
 
 #include <cstdint>
 

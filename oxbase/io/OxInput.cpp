@@ -3,11 +3,13 @@
 #include "oxbase/diag/OxMsg.h"
 #include "oxbase/diag/OxMsgNumbers.h"
 #include "oxbase/diag/OxPrt.h"
-#include "oxbase/io/OxByteOrder.h"
-#include "oxbase/platform/OxPlatformFs.h"
+#include "oxbase/io/detail/OxByteOrder.h"
+#include "oxbase/platform/detail/OxPlatformFs.h"
 
 #include <algorithm>
 #include <cstring>
+
+using namespace oxbase::detail;
 
 using OxByteOrder::bitCast;
 

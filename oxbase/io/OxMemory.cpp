@@ -2,12 +2,13 @@
 
 #include "oxbase/diag/OxMsg.h"
 #include "oxbase/diag/OxMsgNumbers.h"
-#include "oxbase/io/OxByteOrder.h"
 #include "oxbase/io/OxInput.h"
+#include "oxbase/io/detail/OxByteOrder.h"
 
 #include <cstdint>
 #include <cstring>
 
+using namespace oxbase::detail;
 
 OxMemory::OxMemory(unsigned char* bytes, unsigned int size)
     : buffer(bytes), length(bytes != nullptr ? size : 0), current(bytes) {}

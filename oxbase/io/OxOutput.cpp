@@ -2,13 +2,15 @@
 
 #include "oxbase/diag/OxMsg.h"
 #include "oxbase/diag/OxMsgNumbers.h"
-#include "oxbase/io/OxByteOrder.h"
 #include "oxbase/io/OxInput.h"
-#include "oxbase/platform/OxPlatformFs.h"
-#include "oxbase/platform/OxPlatformPath.h"
+#include "oxbase/io/detail/OxByteOrder.h"
+#include "oxbase/platform/detail/OxPlatformFs.h"
+#include "oxbase/platform/detail/OxPlatformPath.h"
 
 #include <cstring>
 #include <string>
+
+using namespace oxbase::detail;
 
 namespace {
 

@@ -1,4 +1,4 @@
-#include "oxbase/core/OxSlabPool.h"
+#include "oxbase/core/detail/OxSlabPool.h"
 
 #include <gtest/gtest.h>
 
@@ -6,6 +6,8 @@
 #include <cstring>
 #include <set>
 #include <vector>
+
+using namespace oxbase::detail;
 
 // Enough blocks of 40 bytes to fill several slabs of every size (4 KiB to
 // 64 KiB): each block must be aligned, apart from all others, and keep what

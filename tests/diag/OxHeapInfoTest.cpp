@@ -33,7 +33,7 @@ void* fakePointer(std::uintptr_t address) {
 }
 
 // The cursor holds the walk's list in cursor[1] and the next block + 1 in cursor[0].
-OxPlatformHeapStatus fakeWalk(OxPlatformHeapEntry* entry) {
+OxHeapWalkStatus fakeWalk(OxHeapWalkEntry* entry) {
     if (entry->cursor[0] == 0) {
         entry->cursor[1] = std::min<size_t>(walksStarted++, fakeWalks.size() - 1);
         entry->cursor[0] = 1;
@@ -41,13 +41,13 @@ OxPlatformHeapStatus fakeWalk(OxPlatformHeapEntry* entry) {
     const std::vector<FakeBlock>& blocks = fakeWalks[entry->cursor[1]];
     size_t next = entry->cursor[0] - 1;
     if (next >= blocks.size()) {
-        return OxPlatformHeapEnd;
+        return OxHeapWalkEnd;
     }
     entry->address = fakePointer(blocks[next].address);
     entry->size = blocks[next].size;
     entry->used = blocks[next].used;
     entry->cursor[0]++;
-    return OxPlatformHeapOk;
+    return OxHeapWalkOk;
 }
 
 // Installs the fake walk for the life of the object and puts back what was there.

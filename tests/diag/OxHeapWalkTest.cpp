@@ -4,6 +4,7 @@
 // the walk ends at once.
 #include "oxbase/core/OxSystem.h"
 #include "oxbase/diag/OxHeapInfo.h"
+#include "oxbase/platform/detail/OxPlatformHeap.h"
 
 #include <gtest/gtest.h>
 
@@ -12,6 +13,8 @@
 #include <memory>
 #include <set>
 #include <vector>
+
+using namespace oxbase::detail;
 
 namespace {
 
@@ -36,8 +39,8 @@ TEST(OxHeapWalk, PictureOfTheRealHeap) {
         picture.snap();
         EXPECT_EQ(picture.getCount(), 0u);
         EXPECT_EQ(picture.getUsedBytes(), 0u);
-        OxPlatformHeapEntry entry;
-        EXPECT_NE(OxPlatformNativeHeapWalk(&entry), OxPlatformHeapOk);
+        OxHeapWalkEntry entry;
+        EXPECT_NE(OxPlatformNativeHeapWalk(&entry), OxHeapWalkOk);
         GTEST_SKIP() << kUnavailable;
     }
     std::unique_ptr<char[]> mine(new char[40]);

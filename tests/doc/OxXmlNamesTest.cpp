@@ -1,10 +1,12 @@
-#include "oxbase/doc/OxXmlNames.h"
+#include "oxbase/doc/detail/OxXmlNames.h"
 #include "oxbase/doc/OxXmlElement.h"
 
 #include <gtest/gtest.h>
 
 #include <string>
 #include <vector>
+
+using namespace oxbase::detail;
 
 TEST(OxXmlNamesTest, EqualNamesShareOneTrimmedText) {
     std::size_t before = OxXmlNames::count();

@@ -2,8 +2,8 @@
 // layer and findFilesByExtension.
 #include "oxbase/io/OxFileTreeWalk.h"
 #include "oxbase/diag/OxPrt.h"
-#include "oxbase/io/OxDirStream.h"
 #include "oxbase/io/OxFile.h"
+#include "oxbase/io/detail/OxDirStream.h"
 #include "support/OxTestSupport.h"
 
 #include <algorithm>
@@ -18,6 +18,8 @@
 #include <sys/stat.h>
 #include <unistd.h>
 #include <vector>
+
+using namespace oxbase::detail;
 
 namespace fs = std::filesystem;
 

@@ -10,7 +10,6 @@
 #include "OxToolCommand.h"
 
 #include "oxbase/diag/OxPrt.h"
-#include "oxbase/platform/OxPlatformPath.h"
 
 #include <algorithm>
 #include <cstdio>
@@ -56,7 +55,7 @@ int runHexdump(int argc, char** argv) {
         std::fprintf(stderr, "usage: oxtool hexdump FILE\n");
         return 2;
     }
-    std::ifstream in(OxPlatformNativePath(argv[1]), std::ios::in | std::ios::binary);
+    std::ifstream in(argv[1], std::ios::in | std::ios::binary);
     if (!in) {
         std::fprintf(stderr, "oxtool hexdump: cannot open %s\n", argv[1]);
         return 1;
@@ -71,7 +70,7 @@ int runHexdump(int argc, char** argv) {
 // Demo: the first 64 bytes of the default message file.
 int demoHexdump(const OxToolDemoContext& context) {
     std::string path = oxtoolJoin(context.dataDir, "oxbase.msg");
-    std::ifstream in(OxPlatformNativePath(path.c_str()), std::ios::in | std::ios::binary);
+    std::ifstream in(path, std::ios::in | std::ios::binary);
     if (!in) {
         std::fprintf(stderr, "oxtool hexdump: cannot open %s\n", path.c_str());
         return 1;

@@ -12,10 +12,13 @@
 // The table lives in static storage that needs no construction or
 // destruction, so names may be taken and released at any time, also by the
 // destructors of other statics. No lock: one thread at a time.
-#ifndef OXBASE_DOC_OXXMLNAMES_H
-#define OXBASE_DOC_OXXMLNAMES_H
+#ifndef OXBASE_DOC_DETAIL_OXXMLNAMES_H
+#define OXBASE_DOC_DETAIL_OXXMLNAMES_H
 
 #include <cstddef>
+
+namespace oxbase {
+namespace detail {
 
 class OxXmlNames {
 public:
@@ -28,5 +31,8 @@ public:
     /// Distinct texts in use (for tests and statistics).
     static std::size_t count();
 };
+
+} // namespace detail
+} // namespace oxbase
 
 #endif

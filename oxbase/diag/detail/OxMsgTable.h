@@ -13,8 +13,8 @@
 //   table.add(12, OxMsgTypeError, 0, "Cannot read %s");
 //   table.continueText(12, "second line");
 //   table.finish();   // "Cannot read %s\n\tsecond line", checked
-#ifndef OXBASE_DIAG_OXMSGTABLE_H
-#define OXBASE_DIAG_OXMSGTABLE_H
+#ifndef OXBASE_DIAG_DETAIL_OXMSGTABLE_H
+#define OXBASE_DIAG_DETAIL_OXMSGTABLE_H
 
 #include "oxbase/core/OxGList.h"
 
@@ -25,6 +25,9 @@
 #include <vector>
 
 struct OxMsgRecord_s;
+
+namespace oxbase {
+namespace detail {
 
 class OxMsgTable {
 public:
@@ -107,5 +110,8 @@ private:
     char* unused = nullptr;                                ///< the free part of the newest block
     std::size_t unusedSize = 0;
 };
+
+} // namespace detail
+} // namespace oxbase
 
 #endif

@@ -9,13 +9,16 @@
 //   OxPlatformFindHandle * handle = OxPlatformFindFirst("/data/*", &name);
 //   while (handle != nullptr && name != nullptr) { ...; if (OxPlatformFindNext(handle, &name) != 0)
 //   break; } OxPlatformFindClose(handle);
-#ifndef OXBASE_PLATFORM_OXPLATFORMDIR_H
-#define OXBASE_PLATFORM_OXPLATFORMDIR_H
+#ifndef OXBASE_PLATFORM_DETAIL_OXPLATFORMDIR_H
+#define OXBASE_PLATFORM_DETAIL_OXPLATFORMDIR_H
 
-#include "oxbase/platform/OxPlatformFs.h"
+#include "oxbase/platform/detail/OxPlatformFs.h"
 
 #include <cstddef>
 #include <string>
+
+namespace oxbase {
+namespace detail {
 
 /// An open directory listing; opaque.
 struct OxPlatformFindHandle;
@@ -46,5 +49,8 @@ std::size_t OxPlatformRootLength(const char* path);
 /// `path` made absolute against the working directory; an absolute path is
 /// copied as it is. False when the working directory cannot be read.
 bool OxPlatformMakeAbsolute(const char* path, std::string& out);
+
+} // namespace detail
+} // namespace oxbase
 
 #endif

@@ -1,15 +1,18 @@
-#include "oxbase/diag/OxMsgTable.h"
+#include "oxbase/diag/detail/OxMsgTable.h"
 
-#include "oxbase/core/OxSlabPool.h"
+#include "oxbase/core/detail/OxSlabPool.h"
 #include "oxbase/diag/OxMsg.h"
-#include "oxbase/diag/OxMsgFormat.h"
 #include "oxbase/diag/OxMsgNumbers.h"
+#include "oxbase/diag/detail/OxMsgFormat.h"
 
 #include <algorithm>
 #include <cstdio>
 #include <cstring>
 #include <iostream>
 #include <new>
+
+namespace oxbase {
+namespace detail {
 
 namespace {
 
@@ -282,3 +285,6 @@ bool OxMsgTable::checkArguments(unsigned int number, OxMsgRecord_s* record) {
     record->text = text;
     return true;
 }
+
+} // namespace detail
+} // namespace oxbase

@@ -1,8 +1,11 @@
-#include "oxbase/core/OxSlabPool.h"
+#include "oxbase/core/detail/OxSlabPool.h"
 
-#include "oxbase/platform/OxCompiler.h"
+#include "oxbase/platform/detail/OxSanitizer.h"
 
 #include <new>
+
+namespace oxbase {
+namespace detail {
 
 namespace {
 constexpr std::size_t kFirstSlabBytes = 4096;
@@ -113,3 +116,6 @@ void OxSlabPool::shrink() noexcept {
     unused = nullptr;
     unusedEnd = nullptr;
 }
+
+} // namespace detail
+} // namespace oxbase

@@ -1,6 +1,6 @@
-#include "oxbase/platform/OxPlatformHeap.h"
+#include "oxbase/platform/detail/OxPlatformHeap.h"
 
-#include "oxbase/platform/OxCompiler.h"
+#include "oxbase/platform/detail/OxSanitizer.h"
 
 #include <cstdlib>
 #include <cstring>
@@ -29,19 +29,22 @@
 #include <unistd.h>
 #endif
 
+namespace oxbase {
+namespace detail {
+
 namespace {
-OxPlatformHeapWalkFunction installedWalk = nullptr;
+OxHeapWalkFunction installedWalk = nullptr;
 } // namespace
 
-OxPlatformHeapStatus OxPlatformHeapWalk(OxPlatformHeapEntry* entry) {
+OxHeapWalkStatus OxPlatformHeapWalk(OxHeapWalkEntry* entry) {
     if (entry == nullptr) {
-        return OxPlatformHeapBad;
+        return OxHeapWalkBad;
     }
     return installedWalk != nullptr ? installedWalk(entry) : OxPlatformNativeHeapWalk(entry);
 }
 
-OxPlatformHeapWalkFunction OxPlatformSetHeapWalk(OxPlatformHeapWalkFunction function) {
-    OxPlatformHeapWalkFunction previous = installedWalk;
+OxHeapWalkFunction OxPlatformSetHeapWalk(OxHeapWalkFunction function) {
+    OxHeapWalkFunction previous = installedWalk;
     installedWalk = function;
     return previous;
 }
@@ -50,9 +53,9 @@ OxPlatformHeapWalkFunction OxPlatformSetHeapWalk(OxPlatformHeapWalkFunction func
 
 // _heapwalk keeps its position in _pentry, which is the block's address: a
 // null address starts the walk, as it does in the entry.
-OxPlatformHeapStatus OxPlatformNativeHeapWalk(OxPlatformHeapEntry* entry) {
+OxHeapWalkStatus OxPlatformNativeHeapWalk(OxHeapWalkEntry* entry) {
     if (entry == nullptr) {
-        return OxPlatformHeapBad;
+        return OxHeapWalkBad;
     }
     _HEAPINFO info;
     info._pentry = static_cast<int*>(entry->address);
@@ -60,12 +63,12 @@ OxPlatformHeapStatus OxPlatformNativeHeapWalk(OxPlatformHeapEntry* entry) {
     info._useflag = entry->used != 0 ? _USEDENTRY : _FREEENTRY;
     int status = _heapwalk(&info);
     if (status != _HEAPOK) {
-        return status == _HEAPEND ? OxPlatformHeapEnd : OxPlatformHeapBad;
+        return status == _HEAPEND ? OxHeapWalkEnd : OxHeapWalkBad;
     }
     entry->address = info._pentry;
     entry->size = info._size;
     entry->used = info._useflag == _USEDENTRY ? 1 : 0;
-    return OxPlatformHeapOk;
+    return OxHeapWalkOk;
 }
 
 bool OxPlatformNativeHeapWalkAvailable() {
@@ -337,34 +340,34 @@ bool mainArenaUsable() {
     return mainArenaChecked;
 }
 
-OxPlatformHeapStatus endWalk(OxPlatformHeapEntry* entry, OxPlatformHeapStatus status) {
+OxHeapWalkStatus endWalk(OxHeapWalkEntry* entry, OxHeapWalkStatus status) {
     entry->cursor[kPhase] = kEnded;
     return status;
 }
 
 } // namespace
 
-OxPlatformHeapStatus OxPlatformNativeHeapWalk(OxPlatformHeapEntry* entry) {
+OxHeapWalkStatus OxPlatformNativeHeapWalk(OxHeapWalkEntry* entry) {
     if (entry == nullptr) {
-        return OxPlatformHeapBad;
+        return OxHeapWalkBad;
     }
     std::uintptr_t* cursor = entry->cursor;
     if (cursor[kPhase] == kStarting) {
         Arena arena;
         if (!mainArenaUsable() || !locateArena(arena)) {
-            return endWalk(entry, OxPlatformHeapEnd);
+            return endWalk(entry, OxHeapWalkEnd);
         }
         // The first chunk has no chunk before it, and glibc marks that as in use.
         if (validChunkSize(arena.first, arena.end) == 0 ||
             (readWord(arena.first + kWord) & kPrevInUse) == 0) {
-            return endWalk(entry, OxPlatformHeapBad);
+            return endWalk(entry, OxHeapWalkBad);
         }
         cursor[kNext] = arena.first;
         cursor[kEnd] = arena.end;
         cursor[kPhase] = kWalking;
     }
     if (cursor[kPhase] != kWalking) {
-        return OxPlatformHeapEnd;
+        return OxHeapWalkEnd;
     }
     // A caller may free between two steps, and the arena may shrink then:
     // the walk never reads beyond the break as it is now.
@@ -376,7 +379,7 @@ OxPlatformHeapStatus OxPlatformNativeHeapWalk(OxPlatformHeapEntry* entry) {
     std::uintptr_t end = cursor[kEnd];
     std::size_t size = validChunkSize(chunk, end);
     if (size == 0) {
-        return endWalk(entry, OxPlatformHeapBad);
+        return endWalk(entry, OxHeapWalkBad);
     }
     // NOLINTNEXTLINE(performance-no-int-to-ptr): the memory malloc handed out for the chunk
     entry->address = reinterpret_cast<void*>(chunk + kHeaderBytes);
@@ -386,11 +389,11 @@ OxPlatformHeapStatus OxPlatformNativeHeapWalk(OxPlatformHeapEntry* entry) {
         // The top chunk: it reaches the break, and no chunk follows it.
         entry->used = 0;
         cursor[kPhase] = kEnded;
-        return OxPlatformHeapOk;
+        return OxHeapWalkOk;
     }
     entry->used = (readWord(next + kWord) & kPrevInUse) != 0 ? 1 : 0;
     cursor[kNext] = next;
-    return OxPlatformHeapOk;
+    return OxHeapWalkOk;
 }
 
 bool OxPlatformNativeHeapWalkAvailable() {
@@ -399,8 +402,8 @@ bool OxPlatformNativeHeapWalkAvailable() {
 
 #else
 
-OxPlatformHeapStatus OxPlatformNativeHeapWalk(OxPlatformHeapEntry* entry) {
-    return entry == nullptr ? OxPlatformHeapBad : OxPlatformHeapEnd;
+OxHeapWalkStatus OxPlatformNativeHeapWalk(OxHeapWalkEntry* entry) {
+    return entry == nullptr ? OxHeapWalkBad : OxHeapWalkEnd;
 }
 
 bool OxPlatformNativeHeapWalkAvailable() {
@@ -408,3 +411,6 @@ bool OxPlatformNativeHeapWalkAvailable() {
 }
 
 #endif
+
+} // namespace detail
+} // namespace oxbase

@@ -1,6 +1,6 @@
-#include "oxbase/platform/OxPlatformDir.h"
+#include "oxbase/platform/detail/OxPlatformDir.h"
 
-#include "oxbase/platform/OxPlatformPath.h"
+#include "oxbase/platform/detail/OxPlatformPath.h"
 
 #include <cctype>
 #include <cerrno>
@@ -14,6 +14,9 @@
 #include <fcntl.h>
 #include <sys/stat.h>
 #endif
+
+namespace oxbase {
+namespace detail {
 
 struct OxPlatformFindHandle {
 #ifdef _WIN32
@@ -194,3 +197,6 @@ bool OxPlatformMakeAbsolute(const char* path, std::string& out) {
     out = rest[0] != '\0' ? OxPlatformJoinPath(cwd, rest) : cwd;
     return true;
 }
+
+} // namespace detail
+} // namespace oxbase

@@ -1,4 +1,4 @@
-#include "oxbase/platform/OxPlatformPath.h"
+#include "oxbase/platform/detail/OxPlatformPath.h"
 
 #include <cerrno>
 #include <vector>
@@ -8,6 +8,9 @@
 #else
 #include <unistd.h>
 #endif
+
+namespace oxbase {
+namespace detail {
 
 char OxPlatformSeparator() {
 #ifdef _WIN32
@@ -71,3 +74,6 @@ bool OxPlatformGetCwd(std::string& out) {
         buffer.resize(buffer.size() * 2);
     }
 }
+
+} // namespace detail
+} // namespace oxbase

@@ -1,4 +1,4 @@
-#include "oxbase/platform/OxPlatformSystem.h"
+#include "oxbase/platform/detail/OxPlatformSystem.h"
 
 #include <cerrno>
 #include <cstdio>
@@ -14,6 +14,9 @@
 #include <time.h>
 #include <unistd.h>
 #endif
+
+namespace oxbase {
+namespace detail {
 
 int OxPlatformOperatingSystem() {
 #if defined(_WIN32)
@@ -325,3 +328,6 @@ int OxPlatformSystemName(char* buffer, size_t size) {
     return OxPlatformStrcpy(buffer, size, names.sysname);
 #endif
 }
+
+} // namespace detail
+} // namespace oxbase

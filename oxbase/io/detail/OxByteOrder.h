@@ -7,12 +7,15 @@
 //
 //   std::uint32_t bits; std::memcpy(&bits, bytes, 4);
 //   float value = OxByteOrder::toFloat(OxByteOrder::swap32(bits));
-#ifndef OXBASE_IO_OXBYTEORDER_H
-#define OXBASE_IO_OXBYTEORDER_H
+#ifndef OXBASE_IO_DETAIL_OXBYTEORDER_H
+#define OXBASE_IO_DETAIL_OXBYTEORDER_H
 
 #include <cstddef>
 #include <cstdint>
 #include <cstring>
+
+namespace oxbase {
+namespace detail {
 
 namespace OxByteOrder {
 
@@ -83,5 +86,8 @@ template <typename T> inline void toBigEndian(unsigned char* bytes, T value) {
 }
 
 } // namespace OxByteOrder
+
+} // namespace detail
+} // namespace oxbase
 
 #endif

@@ -10,12 +10,15 @@
 //   char name[64];
 //   if (OxPlatformStrcpy(name, sizeof name, text) != 0) { /* did not fit */ }
 //   char * token = OxPlatformStrtok(line, " ,", &position);
-#ifndef OXBASE_PLATFORM_OXPLATFORMSYSTEM_H
-#define OXBASE_PLATFORM_OXPLATFORMSYSTEM_H
+#ifndef OXBASE_PLATFORM_DETAIL_OXPLATFORMSYSTEM_H
+#define OXBASE_PLATFORM_DETAIL_OXPLATFORMSYSTEM_H
 
 #include <cstdarg>
 #include <cstddef>
 #include <ctime>
+
+namespace oxbase {
+namespace detail {
 
 /// Code of the running platform: 7 on Windows, 8 on Linux, 0 elsewhere.
 int OxPlatformOperatingSystem();
@@ -58,5 +61,8 @@ int OxPlatformHostName(char* buffer, size_t size);
 /// The name of the operating system (uname's system name, "Microsoft Windows"
 /// on Windows) into `buffer`. Non-zero on failure.
 int OxPlatformSystemName(char* buffer, size_t size);
+
+} // namespace detail
+} // namespace oxbase
 
 #endif

@@ -7,8 +7,11 @@
 //   OxDirStream * stream = OxDirStream::opendir("/data/parts");
 //   while (OxDirStream * entry = OxDirStream::readdir(stream)) use(entry->d_name, entry->d_namlen);
 //   OxDirStream::closedir(stream);
-#ifndef OXBASE_IO_OXDIRSTREAM_H
-#define OXBASE_IO_OXDIRSTREAM_H
+#ifndef OXBASE_IO_DETAIL_OXDIRSTREAM_H
+#define OXBASE_IO_DETAIL_OXDIRSTREAM_H
+
+namespace oxbase {
+namespace detail {
 
 struct OxPlatformFindHandle;
 
@@ -35,5 +38,8 @@ struct OxDirStream {
     /// null stream or a failed close.
     static int closedir(OxDirStream* stream);
 };
+
+} // namespace detail
+} // namespace oxbase
 
 #endif

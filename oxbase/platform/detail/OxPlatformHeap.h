@@ -1,14 +1,14 @@
 // OxPlatformHeap.h: walking the blocks of the process heap.
 //
-// A walk is a loop over one OxPlatformHeapEntry that starts zeroed: each call
+// A walk is a loop over one OxHeapWalkEntry that starts zeroed: each call
 // of OxPlatformHeapWalk delivers the next block (its address, size and
-// whether it is in use) and answers OxPlatformHeapOk, or answers another
+// whether it is in use) and answers OxHeapWalkOk, or answers another
 // status when the walk has ended. The source of the blocks can be replaced
 // by installing a function of the same form (a test installs one that
 // delivers fake blocks); installing null brings back the platform's own.
 //
-//   OxPlatformHeapEntry entry;
-//   while (OxPlatformHeapWalk(&entry) == OxPlatformHeapOk) { total += entry.size; }
+//   OxHeapWalkEntry entry;
+//   while (OxPlatformHeapWalk(&entry) == OxHeapWalkOk) { total += entry.size; }
 //
 // The platform's own source:
 // - Windows: the runtime's _heapwalk with its _HEAPINFO record.
@@ -46,46 +46,29 @@
 // - Built with AddressSanitizer (or another sanitizer that replaces malloc),
 //   with a C library other than glibc, or on any other platform: every walk
 //   ends at once.
-#ifndef OXBASE_PLATFORM_OXPLATFORMHEAP_H
-#define OXBASE_PLATFORM_OXPLATFORMHEAP_H
+#ifndef OXBASE_PLATFORM_DETAIL_OXPLATFORMHEAP_H
+#define OXBASE_PLATFORM_DETAIL_OXPLATFORMHEAP_H
 
-#include <cstddef>
-#include <cstdint>
+#include "oxbase/platform/OxHeapWalk.h"
 
-/// The result of one step of a heap walk.
-enum OxPlatformHeapStatus : int {
-    OxPlatformHeapOk = 0,  ///< a block was delivered
-    OxPlatformHeapEnd = 1, ///< the walk has ended
-    OxPlatformHeapBad = 2  ///< the walk met something it could not read; ended as well
-};
-
-/// One position of a heap walk. Zeroed (as a new object is) it starts a walk;
-/// after each successful step it describes the block delivered. `cursor` is
-/// the source's own bookkeeping and is left alone by callers.
-struct OxPlatformHeapEntry {
-    void* address = nullptr; ///< the block
-    std::size_t size = 0;    ///< its size in bytes
-    int used = 0;            ///< non-zero for a block in use
-    std::uintptr_t cursor[3] = {0, 0, 0};
-};
-
-/// A source of heap blocks: fills `entry` with the block after the one it
-/// describes (the first block for a zeroed entry) and answers
-/// OxPlatformHeapOk, or answers another status at the end.
-using OxPlatformHeapWalkFunction = OxPlatformHeapStatus (*)(OxPlatformHeapEntry* entry);
+namespace oxbase {
+namespace detail {
 
 /// One step of a walk with the installed source, or the platform's own when
-/// none is installed. A null `entry` gives OxPlatformHeapBad.
-OxPlatformHeapStatus OxPlatformHeapWalk(OxPlatformHeapEntry* entry);
+/// none is installed. A null `entry` gives OxHeapWalkBad.
+OxHeapWalkStatus OxPlatformHeapWalk(OxHeapWalkEntry* entry);
 /// Installs `function` as the source of every later walk; null brings back
 /// the platform's own. Returns the source installed before (null for the
 /// platform's own).
-OxPlatformHeapWalkFunction OxPlatformSetHeapWalk(OxPlatformHeapWalkFunction function);
+OxHeapWalkFunction OxPlatformSetHeapWalk(OxHeapWalkFunction function);
 /// One step of the platform's own source, whatever is installed.
-OxPlatformHeapStatus OxPlatformNativeHeapWalk(OxPlatformHeapEntry* entry);
+OxHeapWalkStatus OxPlatformNativeHeapWalk(OxHeapWalkEntry* entry);
 /// Whether the platform's own source delivers blocks in this process (on
 /// Linux: runs the allocator check described above). False means its walks
 /// end at once.
 bool OxPlatformNativeHeapWalkAvailable();
+
+} // namespace detail
+} // namespace oxbase
 
 #endif

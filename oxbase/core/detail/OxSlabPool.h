@@ -20,11 +20,14 @@
 // pool is ready before any code runs and still usable while other statics
 // are destroyed; it holds no memory while no block is in use. No lock: one
 // thread at a time, as everywhere in the library.
-#ifndef OXBASE_CORE_OXSLABPOOL_H
-#define OXBASE_CORE_OXSLABPOOL_H
+#ifndef OXBASE_CORE_DETAIL_OXSLABPOOL_H
+#define OXBASE_CORE_DETAIL_OXSLABPOOL_H
 
 #include <cstddef>
 #include <new>
+
+namespace oxbase {
+namespace detail {
 
 class OxSlabPool {
 public:
@@ -85,5 +88,8 @@ private:
     char* unused = nullptr; ///< the part of the newest slab not yet handed out
     char* unusedEnd = nullptr;
 };
+
+} // namespace detail
+} // namespace oxbase
 
 #endif

@@ -5,11 +5,11 @@
 // the file form of their fields: every field is read and the results summed,
 // writing stops at the first failed write and counts the bytes before it.
 //
-//   oxdetail::setIdentity<4>(m);
-//   long long bytes = oxdetail::writeFields(output, fields, oxdetail::Scaled{2.0f});
-//   float f = oxdetail::narrow(1e300);   // +infinity, by the IEEE rule
-#ifndef OXBASE_GEOM_OXGEOMDETAIL_H
-#define OXBASE_GEOM_OXGEOMDETAIL_H
+//   oxbase::detail::setIdentity<4>(m);
+//   long long bytes = oxbase::detail::writeFields(output, fields, oxbase::detail::Scaled{2.0f});
+//   float f = oxbase::detail::narrow(1e300);   // +infinity, by the IEEE rule
+#ifndef OXBASE_GEOM_DETAIL_OXGEOMDETAIL_H
+#define OXBASE_GEOM_DETAIL_OXGEOMDETAIL_H
 
 #include "oxbase/io/OxInput.h"
 #include "oxbase/io/OxOutput.h"
@@ -18,7 +18,8 @@
 #include <cstddef>
 #include <limits>
 
-namespace oxdetail {
+namespace oxbase {
+namespace detail {
 
 template <int N> void setIdentity(double (&m)[N][N]) {
     for (int i = 0; i < N; i++) {
@@ -113,6 +114,7 @@ long long readScaledFields(OxInput& input, const std::array<float*, K>& fields, 
     return total;
 }
 
-} // namespace oxdetail
+} // namespace detail
+} // namespace oxbase
 
 #endif

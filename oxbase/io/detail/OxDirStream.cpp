@@ -1,14 +1,17 @@
 // OxDirStream.cpp: directory streams over the platform's find handles.
-#include "oxbase/io/OxDirStream.h"
+#include "oxbase/io/detail/OxDirStream.h"
 
 #include "oxbase/diag/OxPrt.h"
-#include "oxbase/platform/OxPlatformDir.h"
+#include "oxbase/platform/detail/OxPlatformDir.h"
 
 #include <cerrno>
 #include <climits>
 #include <cstring>
 #include <iostream>
 #include <new>
+
+namespace oxbase {
+namespace detail {
 
 namespace {
 
@@ -89,3 +92,6 @@ int OxDirStream::closedir(OxDirStream* stream) {
     }
     return result;
 }
+
+} // namespace detail
+} // namespace oxbase

@@ -1,6 +1,6 @@
-#include "oxbase/platform/OxPlatformFs.h"
+#include "oxbase/platform/detail/OxPlatformFs.h"
 
-#include "oxbase/platform/OxPlatformPath.h"
+#include "oxbase/platform/detail/OxPlatformPath.h"
 
 #include <cerrno>
 #include <cstdio>
@@ -13,6 +13,9 @@
 #else
 #include <unistd.h>
 #endif
+
+namespace oxbase {
+namespace detail {
 
 int OxPlatformStat(const char* path, OxStat* status) {
     if (path == nullptr || status == nullptr) {
@@ -195,3 +198,6 @@ std::ofstream* OxPlatformOpenOutput(const char* path, bool binary) {
     return new std::ofstream(OxPlatformNativePath(path), mode);
 #endif
 }
+
+} // namespace detail
+} // namespace oxbase

@@ -9,8 +9,11 @@
 //   char text[] = "done%n";
 //   OxMsgFormatDisarm(text);                      // text is now "done%p"
 //   bool safe = OxMsgFormatFits("In %s, line %u", "suus");   // true
-#ifndef OXBASE_DIAG_OXMSGFORMAT_H
-#define OXBASE_DIAG_OXMSGFORMAT_H
+#ifndef OXBASE_DIAG_DETAIL_OXMSGFORMAT_H
+#define OXBASE_DIAG_DETAIL_OXMSGFORMAT_H
+
+namespace oxbase {
+namespace detail {
 
 /// Rewrites, in place, each %n conversion of `text` as a %p conversion that
 /// keeps its argument number, width and precision and drops its flags and
@@ -26,5 +29,8 @@ unsigned int OxMsgFormatDisarm(char* text);
 /// precision, a numbered argument (`%1$s`), any other length or conversion,
 /// and a '%' at the end of the text make it unfit. A null text fits.
 bool OxMsgFormatFits(const char* text, const char* arguments);
+
+} // namespace detail
+} // namespace oxbase
 
 #endif

@@ -1,9 +1,12 @@
-#include "oxbase/doc/OxXmlNames.h"
+#include "oxbase/doc/detail/OxXmlNames.h"
 
 #include <cctype>
 #include <cstdint>
 #include <cstring>
 #include <new>
+
+namespace oxbase {
+namespace detail {
 
 namespace {
 
@@ -140,3 +143,6 @@ void OxXmlNames::release(char const* name) {
 std::size_t OxXmlNames::count() {
     return table.used;
 }
+
+} // namespace detail
+} // namespace oxbase

@@ -9,10 +9,13 @@
 //
 //   std::string path = OxPlatformJoinPath(directory, "oxbase.msg");
 //   std::ifstream in(OxPlatformNativePath(path.c_str()));
-#ifndef OXBASE_PLATFORM_OXPLATFORMPATH_H
-#define OXBASE_PLATFORM_OXPLATFORMPATH_H
+#ifndef OXBASE_PLATFORM_DETAIL_OXPLATFORMPATH_H
+#define OXBASE_PLATFORM_DETAIL_OXPLATFORMPATH_H
 
 #include <string>
+
+namespace oxbase {
+namespace detail {
 
 /// The separator this platform writes: '/' on POSIX, '\\' on Windows.
 char OxPlatformSeparator();
@@ -26,5 +29,8 @@ std::string OxPlatformNativePath(const char* path);
 std::string OxPlatformJoinPath(const std::string& directory, const char* name);
 /// The working directory; false (and `out` empty) when it cannot be read.
 bool OxPlatformGetCwd(std::string& out);
+
+} // namespace detail
+} // namespace oxbase
 
 #endif

@@ -9,23 +9,17 @@
 //   OxStat status;
 //   if (OxPlatformStat("data\\parts", &status) == 0 && OxPlatformIsDirectoryMode(status)) { ... }
 //   std::ifstream * in = OxPlatformOpenInput("data\\parts\\a.bin", true);
-#ifndef OXBASE_PLATFORM_OXPLATFORMFS_H
-#define OXBASE_PLATFORM_OXPLATFORMFS_H
+#ifndef OXBASE_PLATFORM_DETAIL_OXPLATFORMFS_H
+#define OXBASE_PLATFORM_DETAIL_OXPLATFORMFS_H
 
 #include <cstdint>
 #include <fstream>
 #include <string>
 
-#include <sys/stat.h>
-#include <sys/types.h>
+#include "oxbase/platform/OxStat.h"
 
-/// The file status record of the platform: `struct _stat64i32` on Windows,
-/// `struct stat` on POSIX.
-#ifdef _WIN32
-typedef struct _stat64i32 OxStat;
-#else
-typedef struct stat OxStat;
-#endif
+namespace oxbase {
+namespace detail {
 
 /// Type bits of a status mode (mask 0xf000) and their directory and regular
 /// file values, the same numbers on both platforms.
@@ -83,5 +77,8 @@ void OxPlatformPerror(const char* prefix);
 /// without a writer would block the open forever and a device may never end.
 std::ifstream* OxPlatformOpenInput(const char* path, bool binary);
 std::ofstream* OxPlatformOpenOutput(const char* path, bool binary);
+
+} // namespace detail
+} // namespace oxbase
 
 #endif

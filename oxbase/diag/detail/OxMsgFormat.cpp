@@ -1,6 +1,9 @@
-#include "oxbase/diag/OxMsgFormat.h"
+#include "oxbase/diag/detail/OxMsgFormat.h"
 
 #include <cstring>
+
+namespace oxbase {
+namespace detail {
 
 namespace {
 
@@ -143,3 +146,6 @@ bool OxMsgFormatFits(const char* text, const char* arguments) {
     }
     return true;
 }
+
+} // namespace detail
+} // namespace oxbase
