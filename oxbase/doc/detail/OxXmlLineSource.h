@@ -1,0 +1,125 @@
+// OxXmlLineSource.h: the lines of a text-mode input, whole, for the XML reader.
+//
+//   OxXmlLineSource source(input);
+//   source.start(input.getFileLength());
+//   while (source.next(line, length) == OxXmlLineSource::Line) use(line, length);
+#ifndef OXBASE_DOC_DETAIL_OXXMLLINESOURCE_H
+#define OXBASE_DOC_DETAIL_OXXMLLINESOURCE_H
+
+#include "oxbase/io/OxInput.h"
+
+#include <cstddef>
+#include <cstring>
+#include <new>
+
+namespace oxbase {
+namespace detail {
+
+/// The lines of a text-mode input, whole, whatever their length.
+///
+/// One buffer serves the whole file: blocks are read into it behind the
+/// unfinished line, a finished line is handed out in place, and the buffer
+/// only grows when a single line does not fit. Every byte is read, scanned
+/// and moved at most once, so the work is linear in the file's size.
+class OxXmlLineSource {
+public:
+    explicit OxXmlLineSource(OxInput& in) : input(in) {}
+    OxXmlLineSource(const OxXmlLineSource&) = delete;
+    OxXmlLineSource& operator=(const OxXmlLineSource&) = delete;
+    ~OxXmlLineSource() { delete[] buffer; }
+
+    enum Result { Line, End, ReadFailure, NoMemory };
+
+    /// Prepares to read `length` bytes from the current position.
+    bool start(long long length) {
+        remaining = length > 0 ? length : 0;
+        capacity = kInitialCapacity;
+        buffer = new (std::nothrow) char[capacity];
+        return buffer != nullptr;
+    }
+
+    /// The next line without its line end, in place: `line` and `length`.
+    /// The byte behind the line may be overwritten by the caller.
+    Result next(char*& line, size_t& length) {
+        for (;;) {
+            char* found = static_cast<char*>(std::memchr(buffer + scan, '\n', filled - scan));
+            if (found != nullptr) {
+                line = buffer + lineStart;
+                length = static_cast<size_t>(found - line);
+                lineStart = scan = static_cast<size_t>(found - buffer) + 1;
+                return Line;
+            }
+            scan = filled;
+            if (remaining == 0) {
+                if (lineStart < filled) {
+                    // The last line has no line end: it is read all the same.
+                    line = buffer + lineStart;
+                    length = filled - lineStart;
+                    lineStart = scan = filled;
+                    return Line;
+                }
+                return End;
+            }
+            Result refill = fill();
+            if (refill != Line) {
+                return refill;
+            }
+        }
+    }
+
+private:
+    static constexpr size_t kInitialCapacity = 64 * 1024;
+    static constexpr size_t kMinimumRead = 16 * 1024;
+    static constexpr size_t kMaximumRead = 1u << 30;
+
+    Result fill() {
+        if (lineStart > 0) {
+            std::memmove(buffer, buffer + lineStart, filled - lineStart);
+            filled -= lineStart;
+            scan -= lineStart;
+            lineStart = 0;
+        }
+        if (capacity - 1 - filled < kMinimumRead) {
+            char* bigger = new (std::nothrow) char[capacity * 2];
+            if (bigger == nullptr) {
+                return NoMemory;
+            }
+            std::memcpy(bigger, buffer, filled);
+            delete[] buffer;
+            buffer = bigger;
+            capacity *= 2;
+        }
+        size_t want = capacity - 1 - filled;
+        if (static_cast<long long>(want) > remaining) {
+            want = static_cast<size_t>(remaining);
+        }
+        if (want > kMaximumRead) {
+            want = kMaximumRead;
+        }
+        long long got = input.read(buffer + filled, static_cast<unsigned int>(want));
+        if (got != static_cast<long long>(want)) {
+            return ReadFailure; // reported by the input (2 or 3 and the state)
+        }
+        filled += want;
+        remaining -= static_cast<long long>(want);
+        return Line;
+    }
+
+public:
+    /// Bytes not yet handed out as lines: the rest of the buffer and of the file.
+    size_t unconsumed() const { return static_cast<size_t>(remaining) + (filled - lineStart); }
+
+private:
+    OxInput& input;
+    long long remaining = 0;
+    char* buffer = nullptr;
+    size_t capacity = 0;
+    size_t filled = 0;
+    size_t lineStart = 0;
+    size_t scan = 0;
+};
+
+} // namespace detail
+} // namespace oxbase
+
+#endif

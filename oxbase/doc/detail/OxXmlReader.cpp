@@ -1,0 +1,457 @@
+#include "oxbase/doc/detail/OxXmlReader.h"
+
+#include "oxbase/core/OxString.h"
+#include "oxbase/diag/OxMsg.h"
+#include "oxbase/diag/OxMsgNumbers.h"
+#include "oxbase/doc/OxXmlAttribute.h"
+#include "oxbase/doc/OxXmlElement.h"
+#include "oxbase/io/OxInput.h"
+
+#include <cctype>
+#include <cstring>
+#include <iostream>
+#include <new>
+
+namespace oxbase {
+namespace detail {
+
+OxBool OxXmlReader::run() {
+    if (!source.start(file.input->getFileLength())) {
+        std::cerr << "FATAL: Dynamic storage allocation failure." << std::endl;
+        return OxFalse;
+    }
+    OxBool result = OxTrue;
+    for (;;) {
+        char* line = nullptr;
+        size_t length = 0;
+        OxXmlLineSource::Result got = source.next(line, length);
+        if (got == OxXmlLineSource::End) {
+            // Leave the input at its end, as a line reader would: it is then
+            // no longer good, and a second read stops at once.
+            char probe[2];
+            file.input->getline(probe, sizeof probe, '\n');
+            break;
+        }
+        if (got == OxXmlLineSource::ReadFailure) {
+            result = OxFalse;
+            break;
+        }
+        if (got == OxXmlLineSource::NoMemory) {
+            std::cerr << "FATAL: Dynamic storage allocation failure." << std::endl;
+            result = OxFalse;
+            break;
+        }
+        lineNumber++;
+        // A NUL byte cannot stand in a text: it is read as a blank.
+        unsigned int nuls = 0;
+        for (char* nul = static_cast<char*>(std::memchr(line, '\0', length)); nul != nullptr;
+             nul = static_cast<char*>(std::memchr(nul, '\0', length - (nul - line)))) {
+            *nul = ' ';
+            nuls++;
+        }
+        if (nuls > 0) {
+            OxMsg::Log(OxMsgXmlNulBytes, fileName(), lineNumber, nuls);
+        }
+        char* begin = line;
+        char* end = line + length;
+        while (begin < end && std::isspace(static_cast<unsigned char>(*begin))) {
+            begin++;
+        }
+        while (end > begin && std::isspace(static_cast<unsigned char>(end[-1]))) {
+            end--;
+        }
+        if (begin == end) {
+            continue; // a blank line adds nothing in any state
+        }
+        *end = '\0';
+        lineText = begin;
+        lineEnd = end;
+        cursor = begin;
+        int outcome = kGoOn;
+        while (cursor < lineEnd && outcome == kGoOn) {
+            outcome = step();
+        }
+        if (outcome > 0) {
+            OxMsg::Log(OxMsgXmlErrorPlace, fileName(), lineNumber, offsetOf(cursor), lineText);
+            OxMsg::Log(static_cast<unsigned int>(outcome));
+            result = OxFalse;
+            break;
+        }
+        if (outcome == kAbort) {
+            result = OxFalse;
+            break;
+        }
+    }
+    finish();
+    return result;
+}
+
+int OxXmlReader::step() {
+    switch (state) {
+    case START:
+        return doStart();
+    case CONTENT:
+        return doContent();
+    case COMMENT:
+        return doComment(false);
+    case CDATA:
+        return doComment(true);
+    case DOCTYPE:
+        return doDoctype();
+    case ELEMENT_VALUE:
+        return doElementValue();
+    case ATTRIBUTE:
+        return doAttribute();
+    case ATTRIBUTE_VALUE:
+        return doAttributeValue();
+    case ATTRIBUTE_VALUE_MORE:
+        return doAttributeValueMore();
+    }
+    return kGoOn;
+}
+
+int OxXmlReader::doStart() {
+    char* open = find(cursor, '<');
+    if (open == nullptr || !file.isDeclaration(open)) {
+        return OxMsgXmlNoDeclaration;
+    }
+    cursor = open;
+    OxXmlElement* node =
+        new (std::nothrow) OxXmlElement(OxXmlElement::XML_TYPE_DECLARATION, nullptr);
+    if (node != nullptr) {
+        node->setValue(cursor);
+        delete file.declaration;
+        file.declaration = node;
+    }
+    char* end = std::strstr(cursor, OxXmlFile::OX_XML_DECLARATION_END);
+    cursor = end != nullptr ? end + 2 : lineEnd;
+    state = CONTENT;
+    return kGoOn;
+}
+
+int OxXmlReader::doContent() {
+    char* open = find(cursor, '<');
+    if (open == nullptr) {
+        cursor = lineEnd; // text between elements is ignored
+        return kGoOn;
+    }
+    cursor = open;
+    if (file.isDeclaration(cursor)) {
+        return OxMsgXmlInnerDeclaration;
+    }
+    if (file.isComment(cursor)) {
+        state = COMMENT;
+        return kGoOn;
+    }
+    if (file.isDoctype(cursor)) {
+        state = DOCTYPE;
+        return kGoOn;
+    }
+    if (file.isCdata(cursor)) {
+        state = CDATA;
+        return kGoOn;
+    }
+    char* nameBegin = cursor + 1;
+    while (nameBegin < lineEnd && *nameBegin == ' ') {
+        nameBegin++;
+    }
+    char* nameEnd = nameBegin;
+    while (nameEnd < lineEnd && *nameEnd != ' ' && *nameEnd != '/' && *nameEnd != '>') {
+        nameEnd++;
+    }
+    if (nameEnd == lineEnd) {
+        cursor = lineEnd; // a tag name and its end must stand on one line
+        return kGoOn;
+    }
+    if (*nameEnd == '/' && nameEnd == nameBegin) {
+        cursor = nameEnd + 1;
+        closeByEndTag(open, cursor);
+        return kGoOn; // the rest of the end tag is skipped as text
+    }
+    if (*nameEnd == '/') {
+        cursor = nameEnd;
+        if (nameEnd[1] != '>') {
+            return OxMsgXmlBadTagEnd;
+        }
+        createElement(open, nameBegin, nameEnd, false);
+        cursor = nameEnd + 1;
+        return kGoOn;
+    }
+    createElement(open, nameBegin, nameEnd, true);
+    state = *nameEnd == '>' ? ELEMENT_VALUE : ATTRIBUTE;
+    cursor = nameEnd + 1;
+    return kGoOn;
+}
+
+int OxXmlReader::doElementValue() {
+    skipBlanks();
+    if (cursor == lineEnd) {
+        return kGoOn;
+    }
+    if (*cursor == '<') {
+        state = CONTENT;
+        return kGoOn;
+    }
+    char* open = find(cursor, '<');
+    char* valueEnd = open != nullptr ? open : lineEnd;
+    if (current != nullptr) {
+        withText(cursor, valueEnd, [this](char const* text) { current->setValue(text); });
+    }
+    cursor = valueEnd;
+    if (open == nullptr || open[1] != '/') {
+        return OxMsgXmlBadTagEnd;
+    }
+    closeByEndTag(open, open + 2);
+    char* close = find(open + 2, '>');
+    cursor = close != nullptr ? close + 1 : lineEnd;
+    state = CONTENT;
+    return kGoOn;
+}
+
+int OxXmlReader::doAttribute() {
+    skipBlanks();
+    char* nameBegin = cursor;
+    while (cursor < lineEnd && *cursor != ' ' && *cursor != '/' && *cursor != '=' &&
+           *cursor != '>') {
+        cursor++;
+    }
+    char* nameEnd = cursor;
+    skipBlanks();
+    if (cursor == lineEnd) {
+        return kGoOn; // the tag goes on on the next line
+    }
+    switch (*cursor) {
+    case '/':
+        if (cursor[1] != '>') {
+            return OxMsgXmlBadTagEnd;
+        }
+        if (current != nullptr) {
+            current = current->getParent();
+        }
+        cursor++;
+        state = CONTENT;
+        return kGoOn;
+    case '=':
+        withText(nameBegin, nameEnd,
+                 [this](char const* text) { attribute = new (std::nothrow) OxXmlAttribute(text); });
+        if (current != nullptr) {
+            current->addAttribute(attribute);
+        } else {
+            delete attribute;
+            attribute = nullptr;
+        }
+        cursor++;
+        state = ATTRIBUTE_VALUE;
+        return kGoOn;
+    case '>':
+        cursor++;
+        state = ELEMENT_VALUE;
+        return kGoOn;
+    default:
+        return kGoOn; // a name without "=" is dropped
+    }
+}
+
+int OxXmlReader::doAttributeValue() {
+    skipBlanks();
+    if (cursor == lineEnd) {
+        return kGoOn;
+    }
+    if (*cursor != '"' && *cursor != '\'') {
+        return OxMsgXmlNoQuote;
+    }
+    quote = *cursor++;
+    char* close = find(cursor, quote);
+    if (close != nullptr) {
+        if (attribute != nullptr) {
+            withText(cursor, close, [this](char const* text) { attribute->setValue(text); });
+        }
+        cursor = close + 1;
+        state = ATTRIBUTE;
+        return kGoOn;
+    }
+    // The value goes on on the next lines; each line end becomes one blank.
+    // A quote that ends its line leaves nothing to gather, and the value then
+    // fails at its closing quote.
+    gathered.clear();
+    gatheredValid = cursor < lineEnd &&
+                    gathered.append(cursor, static_cast<size_t>(lineEnd - cursor)) &&
+                    gathered.append(' ');
+    gathering = true;
+    cursor = lineEnd;
+    state = ATTRIBUTE_VALUE_MORE;
+    return kGoOn;
+}
+
+int OxXmlReader::doAttributeValueMore() {
+    char* close = find(cursor, quote);
+    if (close == nullptr) {
+        if (gatheredValid) {
+            gatheredValid = gathered.append(cursor, static_cast<size_t>(lineEnd - cursor)) &&
+                            gathered.append(' ');
+        }
+        cursor = lineEnd;
+        return kGoOn;
+    }
+    gathering = false;
+    if (!gatheredValid) {
+        return kAbort;
+    }
+    if (!gathered.append(cursor, static_cast<size_t>(close - cursor))) {
+        return kAbort;
+    }
+    if (attribute != nullptr) {
+        attribute->setValue(gathered.text());
+    }
+    gathered.clear();
+    cursor = close + 1;
+    state = ATTRIBUTE;
+    return kGoOn;
+}
+
+int OxXmlReader::doComment(bool cdata) {
+    int kind = cdata ? 1 : 0;
+    size_t length = static_cast<size_t>(lineEnd - cursor);
+    if (!commentOpen[kind]) {
+        commentOpen[kind] = true;
+        commentNode[kind] =
+            new (std::nothrow) OxXmlElement(OxXmlElement::XML_TYPE_COMMENT, nullptr);
+        attach(commentNode[kind]);
+        commentText[kind].clear();
+        commentText[kind].expectAtMost(length + source.unconsumed());
+        commentText[kind].append(cursor, length);
+    } else {
+        commentText[kind].append('\n');
+        commentText[kind].append(cursor, length);
+    }
+    char const* marker = cdata ? OxXmlFile::OX_XML_CDATA_END : OxXmlFile::OX_XML_COMMENT_END;
+    if (std::strstr(cursor, marker) != nullptr) {
+        // The rest of the line is in the value but is not read.
+        finishComment(cdata);
+        state = CONTENT;
+    }
+    cursor = lineEnd;
+    return kGoOn;
+}
+
+int OxXmlReader::doDoctype() {
+    size_t length = static_cast<size_t>(lineEnd - cursor);
+    if (file.doctype == nullptr) {
+        OxXmlElement* node =
+            new (std::nothrow) OxXmlElement(OxXmlElement::XML_TYPE_DOCTYPE, nullptr);
+        file.doctype = node;
+        attach(node);
+        doctypeText.clear();
+        doctypeText.append(cursor, length);
+        doctypeLoaded = true;
+    } else {
+        if (!doctypeLoaded) {
+            // A DOCTYPE of an earlier read: go on from its text.
+            char const* old = file.doctype->getValue();
+            doctypeText.clear();
+            doctypeText.append(nameOrEmpty(old), std::strlen(nameOrEmpty(old)));
+            doctypeLoaded = true;
+        }
+        doctypeText.append('\n');
+        doctypeText.append(cursor, length);
+    }
+    char* close = find(cursor, '>');
+    if (close != nullptr) {
+        cursor = close + 1; // the rest of the line is read as content
+        state = CONTENT;
+    } else {
+        cursor = lineEnd;
+    }
+    return kGoOn;
+}
+
+void OxXmlReader::createElement(char* tagStart, char* nameBegin, char* nameEnd, bool makeCurrent) {
+    OxXmlElement* element = nullptr;
+    withText(nameBegin, nameEnd,
+             [&element](char const* text) { element = new (std::nothrow) OxXmlElement(text); });
+    if (element == nullptr) {
+        return; // no memory: the node is absent
+    }
+    if (file.root == nullptr) {
+        file.root = element;
+    } else if (current != nullptr) {
+        current->addChild(element);
+        element->setParent(current);
+    } else {
+        // A second element at top level has no parent to go to: it is kept
+        // behind the root, where the writer writes it back.
+        OxMsg::Log(OxMsgXmlSecondTopLevel, fileName(), lineNumber, offsetOf(tagStart),
+                   nameOrEmpty(element->getName()));
+        file.postRootNodes.append(element);
+    }
+    if (makeCurrent) {
+        current = element;
+    }
+}
+
+void OxXmlReader::closeByEndTag(char* tagStart, char* nameBegin) {
+    if (current == nullptr) {
+        return; // no open element: the end tag is ignored
+    }
+    char* nameEnd = nameBegin;
+    while (nameEnd < lineEnd && *nameEnd != ' ' && *nameEnd != '>') {
+        nameEnd++;
+    }
+    char const* openName = nameOrEmpty(current->getName());
+    size_t length = static_cast<size_t>(nameEnd - nameBegin);
+    if (std::strlen(openName) != length || std::strncmp(openName, nameBegin, length) != 0) {
+        withText(nameBegin, nameEnd, [this, openName, tagStart](char const* endName) {
+            OxMsg::Log(OxMsgXmlEndTagMismatch, fileName(), lineNumber, offsetOf(tagStart), endName,
+                       openName);
+        });
+    }
+    current = current->getParent();
+}
+
+void OxXmlReader::attach(OxXmlElement* node) {
+    if (node == nullptr) {
+        return;
+    }
+    if (current != nullptr) {
+        current->addChild(node);
+        node->setParent(current);
+    } else if (file.root == nullptr) {
+        file.preRootNodes.append(node);
+    } else {
+        file.postRootNodes.append(node);
+    }
+}
+
+void OxXmlReader::finishComment(bool cdata) {
+    int kind = cdata ? 1 : 0;
+    if (commentNode[kind] != nullptr) {
+        char* whole = commentText[kind].releaseLong();
+        if (whole != nullptr) {
+            commentNode[kind]->adoptValue(whole);
+        } else {
+            commentNode[kind]->setValue(commentText[kind].text());
+        }
+    }
+    commentNode[kind] = nullptr;
+    commentOpen[kind] = false;
+    commentText[kind].clear();
+}
+
+void OxXmlReader::finish() {
+    // What stands open at the end keeps what was gathered.
+    if (commentOpen[0]) {
+        finishComment(false);
+    }
+    if (commentOpen[1]) {
+        finishComment(true);
+    }
+    if (doctypeLoaded && file.doctype != nullptr) {
+        file.doctype->setValue(doctypeText.text());
+    }
+    if (gathering && gatheredValid && attribute != nullptr) {
+        attribute->setValue(gathered.text());
+    }
+}
+
+} // namespace detail
+} // namespace oxbase

@@ -1,0 +1,129 @@
+// OxXmlReader.h: the state machine behind OxXmlFile::readFile.
+//
+//   OxXmlReader reader(document);   // document opened for input and rewound
+//   OxBool complete = reader.run();
+#ifndef OXBASE_DOC_DETAIL_OXXMLREADER_H
+#define OXBASE_DOC_DETAIL_OXXMLREADER_H
+
+#include "oxbase/doc/OxXmlFile.h"
+#include "oxbase/doc/detail/OxXmlLineSource.h"
+#include "oxbase/doc/detail/OxXmlTextBuffer.h"
+
+#include <cstddef>
+#include <cstring>
+
+class OxXmlAttribute;
+class OxXmlElement;
+
+namespace oxbase {
+namespace detail {
+
+/// The state machine of OxXmlFile::readFile, over one document.
+///
+/// Each line is trimmed; blank lines are skipped in every state. The state
+/// survives the line end, the position inside a tag does not always:
+///
+///   START                 the first markup must be "<?xml"; its line is the
+///                         declaration node
+///   CONTENT               looks for the next "<": comment, DOCTYPE, CDATA,
+///                         end tag (closes the open element by nesting),
+///                         empty element, or start tag
+///   ELEMENT_VALUE         behind ">": a text value must close on its line
+///   ATTRIBUTE             an attribute name, "/>", ">" or the line's end
+///   ATTRIBUTE_VALUE       the opening quote and the value on its line
+///   ATTRIBUTE_VALUE_MORE  a value going on over lines, joined by one blank
+///   COMMENT, CDATA        raw text up to "-->" / "]]>", lines joined by "\n"
+///   DOCTYPE               raw text up to the first ">"
+///
+/// Only the blank counts as space inside a tag. Nothing is decoded: values
+/// keep their bytes. Texts gathered over many lines grow in place and are
+/// stored once, so the work stays linear in the size of the input.
+class OxXmlReader {
+public:
+    explicit OxXmlReader(OxXmlFile& document) : file(document), source(*document.input) {}
+    OxXmlReader(const OxXmlReader&) = delete;
+    OxXmlReader& operator=(const OxXmlReader&) = delete;
+
+    OxBool run();
+
+private:
+    enum State {
+        START,
+        CONTENT,
+        COMMENT,
+        DOCTYPE,
+        CDATA,
+        ELEMENT_VALUE,
+        ATTRIBUTE,
+        ATTRIBUTE_VALUE,
+        ATTRIBUTE_VALUE_MORE
+    };
+    /// What a state step gives: go on, a syntax error (its number), or the
+    /// silent end of a value that opened at a line end.
+    static constexpr int kGoOn = 0;
+    static constexpr int kAbort = -1;
+
+    int step();
+    int doStart();
+    int doContent();
+    int doElementValue();
+    int doAttribute();
+    int doAttributeValue();
+    int doAttributeValueMore();
+    int doComment(bool cdata);
+    int doDoctype();
+
+    char* find(char* from, char c) const {
+        return static_cast<char*>(std::memchr(from, c, static_cast<size_t>(lineEnd - from)));
+    }
+    void skipBlanks() {
+        while (cursor < lineEnd && *cursor == ' ') {
+            cursor++;
+        }
+    }
+    unsigned int offsetOf(char const* position) const {
+        return static_cast<unsigned int>(position - lineText);
+    }
+    /// A trimmed copy of [begin, end) stored by `store` (setValue, a constructor).
+    template <class Store> void withText(char* begin, char* end, Store store) {
+        char saved = *end;
+        *end = '\0';
+        store(begin);
+        *end = saved;
+    }
+    void createElement(char* tagStart, char* nameBegin, char* nameEnd, bool makeCurrent);
+    void closeByEndTag(char* tagStart, char* nameBegin);
+    void attach(OxXmlElement* node);
+    void finishComment(bool cdata);
+    void finish();
+    static char const* nameOrEmpty(char const* text) { return text != nullptr ? text : ""; }
+    char const* fileName() const { return nameOrEmpty(file.input->getFilename()); }
+
+    OxXmlFile& file;
+    OxXmlLineSource source;
+    State state = START;
+    unsigned int lineNumber = 0;
+    char* lineText = nullptr;
+    char* lineEnd = nullptr;
+    char* cursor = nullptr;
+
+    OxXmlElement* current = nullptr;
+    // Comment and CDATA in progress: the node and its text so far.
+    bool commentOpen[2] = {false, false};
+    OxXmlElement* commentNode[2] = {nullptr, nullptr};
+    OxXmlTextBuffer commentText[2];
+    // The DOCTYPE text: gathered over the whole read, stored at its end.
+    bool doctypeLoaded = false;
+    OxXmlTextBuffer doctypeText;
+    // The attribute in progress and its value gathered over several lines.
+    OxXmlAttribute* attribute = nullptr;
+    char quote = '"';
+    bool gatheredValid = false;
+    bool gathering = false;
+    OxXmlTextBuffer gathered;
+};
+
+} // namespace detail
+} // namespace oxbase
+
+#endif

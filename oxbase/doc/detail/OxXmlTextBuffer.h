@@ -1,0 +1,103 @@
+// OxXmlTextBuffer.h: a growable text for the XML reader and writer.
+//
+// Texts gathered over many lines (comments, multi-line attribute values) and
+// the lines of the writer are built here: appending is amortised constant
+// per character, and a long text jumps to its known bound instead of being
+// copied at every doubling.
+//
+//   OxXmlTextBuffer text;
+//   text.append("<!-- a", 6);  text.append('\n');
+//   use(text.text());
+#ifndef OXBASE_DOC_DETAIL_OXXMLTEXTBUFFER_H
+#define OXBASE_DOC_DETAIL_OXXMLTEXTBUFFER_H
+
+#include <cstddef>
+#include <cstring>
+#include <new>
+
+namespace oxbase {
+namespace detail {
+
+/// A growable text: appending is amortised constant per character, so
+/// texts gathered over many lines cost linear time.
+class OxXmlTextBuffer {
+public:
+    OxXmlTextBuffer() = default;
+    OxXmlTextBuffer(const OxXmlTextBuffer&) = delete;
+    OxXmlTextBuffer& operator=(const OxXmlTextBuffer&) = delete;
+    ~OxXmlTextBuffer() { delete[] data; }
+
+    void clear() {
+        length = 0;
+        if (data != nullptr) {
+            data[0] = '\0';
+        }
+    }
+    /// False when memory ran out; the text is then unchanged.
+    bool append(char const* text, size_t count) {
+        if (!reserve(length + count + 1)) {
+            return false;
+        }
+        std::memcpy(data + length, text, count);
+        length += count;
+        data[length] = '\0';
+        return true;
+    }
+    bool append(char c) { return append(&c, 1); }
+    /// The text, NUL-terminated; "" while nothing was appended.
+    char const* text() const { return data != nullptr ? data : ""; }
+    /// Tells the buffer that its text will not grow beyond `maxLength`
+    /// characters (what is left of the input bounds a gathered text).
+    void expectAtMost(size_t maxLength) { ceiling = maxLength + 1; }
+    /// Hands the text over as a new[] array when that saves a copy of a long
+    /// text (it fills at least half of its array); null otherwise, and the
+    /// caller copies text().
+    char* releaseLong() {
+        if (data == nullptr || length < kLongText || length < capacity / 2) {
+            return nullptr;
+        }
+        char* text = data;
+        data = nullptr;
+        length = 0;
+        capacity = 0;
+        return text;
+    }
+
+private:
+    bool reserve(size_t needed) {
+        if (needed <= capacity) {
+            return true;
+        }
+        size_t grown = capacity < 64 ? 64 : capacity;
+        while (grown < needed) {
+            grown *= 2;
+        }
+        // A long text jumps to the most it can still become, so that it is
+        // neither copied at every doubling nor given twice the room it needs.
+        if (grown > kLongText && ceiling >= needed) {
+            grown = ceiling;
+        }
+        char* bigger = new (std::nothrow) char[grown];
+        if (bigger == nullptr) {
+            return false;
+        }
+        if (length > 0) {
+            std::memcpy(bigger, data, length);
+        }
+        delete[] data;
+        data = bigger;
+        capacity = grown;
+        return true;
+    }
+
+    static constexpr size_t kLongText = 1u << 20;
+    char* data = nullptr;
+    size_t length = 0;
+    size_t capacity = 0;
+    size_t ceiling = 0;
+};
+
+} // namespace detail
+} // namespace oxbase
+
+#endif
