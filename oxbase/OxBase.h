@@ -8,6 +8,29 @@
 //   #include "oxbase/OxBase.h"
 //   OxMsg msg("oxbase.msg", dataDir, "run.log", nullptr);
 //   OxLimits::initTolerances();
+//
+// Failures are told by OxBool, a null pointer or a count, and the words for
+// a human go through OxMsg by message number (OxMsgNumbers.h names them).
+//
+// Memory, one rule. The library allocates with plain `new` and the standard
+// containers, so exhausted memory is one signal, std::bad_alloc; it never
+// uses `new (std::nothrow)` and throws nothing of its own.
+//  - An operation that describes what it does without memory catches the
+//    signal where it arises and does that: the message buffer of OxMsg, the
+//    records of OxRangeList (message 228), the directory streams (errno 12),
+//    the buffers of OxFileTreeWalk (its debug text and -1), the pictures of
+//    OxHeapInfo (no entries, or no diff).
+//  - The operations that take outside input or build large structures catch
+//    it at their boundary: OxXmlFile::readFile and writeFile, OxCsvFile::
+//    readFile and writeFile, the OxMsg constructor (the subsystem then does
+//    not start), OxFileList::readListFiles and OxFileTreeWalk::run. They
+//    write "FATAL: Dynamic storage allocation failure." on standard error,
+//    leave their object whole (an XML or CSV reader then holds no document
+//    at all, never part of one; a list keeps the names read before, each
+//    whole) and answer their failure result.
+//  - Every other operation is exception-neutral: std::bad_alloc reaches its
+//    caller, as from the standard containers, and the object it worked on is
+//    as it was before the call. No object is ever left half-built.
 #ifndef OXBASE_OXBASE_H
 #define OXBASE_OXBASE_H
 

@@ -12,6 +12,8 @@
 
 #include "oxbase/core/OxTypes.h"
 
+#include <new>
+
 #include <cstdio>
 
 namespace oxbase {
@@ -68,6 +70,8 @@ public:
 
     /// Grows the array to the smallest power of two not below `count`
     /// (1 for a count below 2). A count within the capacity changes nothing.
+    /// Without memory, or for a count above 2^31, std::bad_alloc and the list
+    /// is unchanged.
     void reserve(unsigned int count) {
         if (count <= capacity) {
             return;
@@ -77,7 +81,9 @@ public:
             newCapacity <<= 1;
         }
         if (newCapacity == 0) {
-            return; // no power of two holds `count`: out of the design's range
+            // No power of two holds `count`: the array cannot grow, which is
+            // told as exhausted memory is.
+            throw std::bad_alloc();
         }
         T* grown = new T[newCapacity];
         if (length != 0 && data != nullptr) {
@@ -92,15 +98,11 @@ public:
 
     /// Stores `value` behind the last element; returns the index it got.
     /// `value` may be an element of this list: it is copied before the array
-    /// grows. A list of 2^31 elements cannot grow: the value is not stored
-    /// and the result is the unchanged length.
+    /// grows. Without memory std::bad_alloc, and the list is unchanged.
     unsigned int append(const T& value) {
         if (capacity <= length) {
             T copy = value;
             reserve(length + 1);
-            if (capacity <= length) {
-                return length;
-            }
             data[length] = copy;
         } else {
             data[length] = value;
@@ -115,18 +117,18 @@ public:
     /// outside the array.
     T& operator[](unsigned int index) {
         checkRange(index);
-        return index < capacity ? data[index] : spareSlot();
+        return index < capacity && data != nullptr ? data[index] : spareSlot();
     }
     const T& operator[](unsigned int index) const {
         checkRange(index);
-        return index < capacity ? data[index] : spareSlot();
+        return index < capacity && data != nullptr ? data[index] : spareSlot();
     }
 
     /// Stores `value` in the slot at `index`, after the same range report; an
     /// index with no slot stores nothing.
     void set(unsigned int index, const T& value) {
         checkRange(index);
-        if (index < capacity) {
+        if (index < capacity && data != nullptr) {
             data[index] = value;
         }
     }

@@ -9,13 +9,12 @@
 //   4. the number conversion printer   OxString::conversionPrt
 //   5. the table of names (13 slots)   OxName::table
 //   6. the attribute print object      OxXmlAttribute's conversion printer
+#include "oxbase/core/OxName.h"
 #include "oxbase/core/OxString.h"
 #include "oxbase/diag/OxMsg.h"
 #include "oxbase/diag/OxPrt.h"
 #include "oxbase/doc/OxXmlAttribute.h"
-#include "oxbase/core/OxName.h"
 #include "oxbase/geom/OxRot.h"
-// @@STATICS-INCLUDES@@
 
 // 1. The identity matrix.
 const OxRot OX_IDENTITY_3X3_MATRIX = OxRot::identity();
@@ -29,7 +28,7 @@ OxPrt OxPrt::tracePrt;
 // 4. The print object of the number and time conversions.
 OxPrt OxString::conversionPrt;
 
-// 5./6. The table of names and its tear-down.
+// 5. The table of names.
 // The table is constant-initialised (no slots); the guard below gives it its
 // 13 slots once, whatever number of guards run, and the table's destructor,
 // registered with its definition, releases it at unload after the guard.
@@ -53,5 +52,5 @@ public:
 
 static OxNameTableGuard oxNameTableGuard;
 
-// 7. The print object of the attribute value conversions.
+// 6. The print object of the attribute value conversions.
 OxPrt OxXmlAttribute::conversionPrt;

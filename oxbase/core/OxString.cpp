@@ -109,10 +109,11 @@ void OxString::assign(const char* text, size_t length) {
         str = small;
         capacity = sizeof small;
     } else if (capacity < need) {
+        char* grown = new char[need]; // first: without memory the text stays
         if (onHeap()) {
             delete[] str;
         }
-        str = new char[need];
+        str = grown;
     }
     std::memmove(str, text, need);
     capacity = need;

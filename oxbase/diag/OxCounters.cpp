@@ -48,6 +48,7 @@ void OxCounters::add(const char* name) {
     if (name == nullptr || getByName(name) != nullptr) {
         return;
     }
+    reserve(length + 1); // the room first: append then cannot fail and lose the counter
     append(new OxCounter(name));
 }
 

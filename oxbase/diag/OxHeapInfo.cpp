@@ -1,5 +1,6 @@
 #include "oxbase/diag/OxHeapInfo.h"
 
+#include "oxbase/core/detail/OxNoMemory.h"
 #include "oxbase/diag/OxPrt.h"
 #include "oxbase/platform/detail/OxPlatformHeap.h"
 
@@ -49,9 +50,8 @@ void OxHeapInfo::snap() {
     if (count == 0) {
         return;
     }
-    entries = new (std::nothrow) HeapEntry[count + 1]();
-    if (entries == nullptr) {
-        init();
+    if (!withMemory([&] { entries = new HeapEntry[count + 1](); })) {
+        init(); // no memory for the picture: no picture
         return;
     }
     unsigned int filled = 0;
@@ -147,16 +147,15 @@ OxHeapInfo* OxHeapInfo::diff(OxHeapInfo& other) {
         }
         return found;
     };
-    OxHeapInfo* result = new (std::nothrow) OxHeapInfo;
-    if (result == nullptr) {
+    OxHeapInfo* result = nullptr;
+    if (!withMemory([&] { result = new OxHeapInfo; })) {
         return nullptr;
     }
     unsigned int found = walk(nullptr);
     if (found == 0) {
         return result;
     }
-    result->entries = new (std::nothrow) HeapEntry[found]();
-    if (result->entries == nullptr) {
+    if (!withMemory([&] { result->entries = new HeapEntry[found](); })) {
         delete result;
         return nullptr;
     }

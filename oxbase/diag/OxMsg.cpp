@@ -1,6 +1,7 @@
 #include "oxbase/diag/OxMsg.h"
 
 #include "oxbase/core/OxString.h"
+#include "oxbase/core/detail/OxNoMemory.h"
 #include "oxbase/diag/detail/OxMsgTable.h"
 #include "oxbase/platform/detail/OxPlatformFs.h"
 #include "oxbase/platform/detail/OxPlatformPath.h"
@@ -9,6 +10,7 @@
 #include <cstring>
 #include <iomanip>
 #include <iostream>
+#include <memory>
 #include <new>
 #include <string>
 
@@ -77,13 +79,12 @@ OxErrorCode severityOf(std::uint32_t type) {
     }
 }
 
-/// A trimmed copy of `name` (a new array), null when nothing is left.
-char* trimmedCopy(const char* name) {
-    char* copy = OxString::dup(name);
-    OxString::stripWhite(copy);
-    if (copy != nullptr && *copy == '\0') {
-        delete[] copy;
-        return nullptr;
+/// A trimmed copy of `name`, null when nothing is left.
+std::unique_ptr<char[]> trimmedCopy(const char* name) {
+    std::unique_ptr<char[]> copy(OxString::dup(name));
+    OxString::stripWhite(copy.get());
+    if (copy != nullptr && copy[0] == '\0') {
+        copy.reset();
     }
     return copy;
 }
@@ -130,8 +131,7 @@ OxMsg::OxMsg(const char* messageFileName, const char* msgDirectory, const char* 
         shutdown();
     }
     if (buf == nullptr) {
-        buf = new (std::nothrow) char[kInitialBufferSize];
-        if (buf == nullptr) {
+        if (!withMemory([] { buf = new char[kInitialBufferSize]; })) {
             std::cerr << "Message file buffer is NULL."
                       << "\n";
             buflen = 0;
@@ -146,12 +146,21 @@ OxMsg::OxMsg(const char* messageFileName, const char* msgDirectory, const char* 
                   << "\n";
         return;
     }
+    // Without memory on the way the start fails like any other step: the
+    // subsystem does not run, and what was read stays until the shutdown.
+    if (!withMemory([&] { start(messageFileName, msgDirectory, logName, logDirectory); })) {
+        closeAndDelete(msgFile);
+        reportNoMemory();
+    }
+}
 
+void OxMsg::start(const char* messageFileName, const char* msgDirectory, const char* logName,
+                  const char* logDirectory) {
     // The file is looked for in the working directory first, then in
     // `msgDirectory`; an absolute name is opened as it stands. An empty name
     // has no file to find and fails like a missing one.
-    char* name = trimmedCopy(messageFileName);
-    const char* shownName = name != nullptr ? name : "";
+    std::unique_ptr<char[]> name = trimmedCopy(messageFileName);
+    const char* shownName = name != nullptr ? name.get() : "";
     std::string directoryPath;
     std::string opened;
     auto tryOpen = [&opened](const std::string& path) {
@@ -170,12 +179,12 @@ OxMsg::OxMsg(const char* messageFileName, const char* msgDirectory, const char* 
     };
     bool found = false;
     if (name != nullptr) {
-        if (OxPlatformIsAbsolute(name)) {
-            found = tryOpen(name);
+        if (OxPlatformIsAbsolute(name.get())) {
+            found = tryOpen(name.get());
         } else {
-            found = tryOpen(pathIn(nullptr, name));
+            found = tryOpen(pathIn(nullptr, name.get()));
             if (!found && msgDirectory != nullptr) {
-                directoryPath = pathIn(msgDirectory, name);
+                directoryPath = pathIn(msgDirectory, name.get());
                 found = tryOpen(directoryPath);
             }
         }
@@ -193,31 +202,26 @@ OxMsg::OxMsg(const char* messageFileName, const char* msgDirectory, const char* 
         if (OxPlatformGetCwd(cwd)) {
             std::cerr << "in current working directory, " << cwd << "\n" << std::flush;
         }
-        delete[] name;
         return;
     }
-    delete[] name;
 
     // A start that failed at its log file keeps its name until shutdown; a
     // new start before that replaces it.
+    char* fullName = OxString::dup(opened.c_str());
     delete[] msgFileName;
-    msgFileName = OxString::dup(opened.c_str());
+    msgFileName = fullName;
     if (msgTable == nullptr) {
         msgTable = new OxMsgTable(msgList);
     }
     readMessageFile();
     closeAndDelete(msgFile);
 
-    char* logName2 = trimmedCopy(logName);
-    if (logName2 == nullptr) {
-        valid = OxTrue;
-        state = OxMsgActive;
-        return;
-    }
-    logFile = openLog(logName2, logDirectory);
-    delete[] logName2;
-    if (logFile == nullptr) {
-        return;
+    std::unique_ptr<char[]> trimmedLog = trimmedCopy(logName);
+    if (trimmedLog != nullptr) {
+        logFile = openLog(trimmedLog.get(), logDirectory);
+        if (logFile == nullptr) {
+            return;
+        }
     }
     valid = OxTrue;
     state = OxMsgActive;
@@ -231,7 +235,6 @@ void OxMsg::readMessageFile() {
     std::ifstream& in = *msgFile;
     unsigned int lineCount = 0;
     unsigned int number = 0;
-    bool memoryLeft = true;
     char text[kTextLimit + 1];
     while (in.good()) {
         in >> std::dec >> number;
@@ -246,10 +249,7 @@ void OxMsg::readMessageFile() {
         if (msgTable->knows(number)) {
             // A known number continues the text of its message on a new line.
             readText(in, text);
-            memoryLeft = msgTable->continueText(number, text);
-            if (!memoryLeft) {
-                break;
-            }
+            msgTable->continueText(number, text);
             continue;
         }
         std::uint32_t type = OxMsgTypeUnknown;
@@ -277,19 +277,11 @@ void OxMsg::readMessageFile() {
             in >> std::dec >> level;
         }
         readText(in, text);
-        memoryLeft = msgTable->add(number, type, level, text);
-        if (!memoryLeft) {
-            break;
-        }
+        msgTable->add(number, type, level, text);
     }
     // Joined texts are stored and every new text is checked, also when the
     // reading ended early: what was read stays in force.
-    memoryLeft = msgTable->finish() && memoryLeft;
-    if (!memoryLeft) {
-        std::cerr << "FATAL: Dynamic storage allocation failure."
-                  << "\n"
-                  << std::flush;
-    }
+    msgTable->finish();
     if (!in.eof() && in.fail()) {
         std::cerr << "Error reading message file " << msgFileName << " at line " << lineCount
                   << "\n"
@@ -299,18 +291,17 @@ void OxMsg::readMessageFile() {
 
 std::ofstream* OxMsg::openLog(const char* name, const char* directory) {
     std::string path = pathIn(directory, name);
-    logFileName = OxString::dup(path.c_str());
-    auto* stream =
-        new std::ofstream(OxPlatformNativePath(path.c_str()), std::ios::out | std::ios::trunc);
+    std::unique_ptr<char[]> fullName(OxString::dup(path.c_str()));
+    std::unique_ptr<std::ofstream> stream(
+        new std::ofstream(OxPlatformNativePath(path.c_str()), std::ios::out | std::ios::trunc));
     if (path.empty() || !stream->good()) {
-        delete stream;
         std::cerr << " Unable to open " << path << "\n" << std::flush;
-        delete[] logFileName;
-        logFileName = nullptr;
         return nullptr;
     }
     stream->setf(std::ios::left, std::ios::adjustfield);
-    return stream;
+    delete[] logFileName;
+    logFileName = fullName.release();
+    return stream.release();
 }
 
 void OxMsg::openLogFile(const char* name, const char* directory) {
@@ -322,15 +313,21 @@ void OxMsg::openLogFile(const char* name, const char* directory) {
         delete[] logFileName;
         logFileName = nullptr;
     }
-    char* trimmed = trimmedCopy(name);
-    if (trimmed == nullptr) {
-        std::cerr << "Log file name is null.  No logging will be done."
-                  << "\n"
-                  << std::flush;
-        return;
+    // Without memory for the name or the stream, logging goes on without a
+    // log file, as after any other failure to open one.
+    bool opened = withMemory([&] {
+        std::unique_ptr<char[]> trimmed = trimmedCopy(name);
+        if (trimmed == nullptr) {
+            std::cerr << "Log file name is null.  No logging will be done."
+                      << "\n"
+                      << std::flush;
+            return;
+        }
+        logFile = openLog(trimmed.get(), directory);
+    });
+    if (!opened) {
+        reportNoMemory();
     }
-    logFile = openLog(trimmed, directory);
-    delete[] trimmed;
 }
 
 void OxMsg::closeLogFile() {
@@ -385,8 +382,8 @@ OxMsgRecord_s* OxMsg::format(unsigned int number, va_list arguments) {
             grown *= 2;
         }
         delete[] buf;
-        buf = new (std::nothrow) char[static_cast<size_t>(grown)];
-        buflen = buf != nullptr ? grown : 0;
+        buf = nullptr;
+        buflen = withMemory([grown] { buf = new char[static_cast<size_t>(grown)]; }) ? grown : 0;
     }
     buf[buflen - 1] = '\0';
     return record;

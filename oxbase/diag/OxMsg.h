@@ -97,6 +97,10 @@ private:
     /// Formats record `number` into `buf`; null when not logged.
     static OxMsgRecord_s* format(unsigned int number, va_list arguments);
     static void shutdown();
+    /// The start after the buffer: find and read the message file, open the
+    /// log. std::bad_alloc reaches the constructor, which fails the start.
+    static void start(const char* messageFileName, const char* msgDirectory, const char* logName,
+                      const char* logDirectory);
     static void readMessageFile();
     static std::ofstream* openLog(const char* name, const char* directory);
 

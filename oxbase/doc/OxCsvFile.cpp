@@ -1,6 +1,7 @@
 #include "oxbase/doc/OxCsvFile.h"
 
 #include "oxbase/core/OxString.h"
+#include "oxbase/core/detail/OxNoMemory.h"
 #include "oxbase/diag/OxMsg.h"
 #include "oxbase/diag/OxMsgNumbers.h"
 #include "oxbase/diag/OxPrt.h"
@@ -13,8 +14,11 @@
 #include <cstdio>
 #include <cstring>
 #include <iostream>
+#include <memory>
 #include <new>
 #include <string>
+
+using namespace oxbase::detail;
 
 char const OxCsvFile::OX_CSV_COMMENT_START = '#';
 
@@ -80,11 +84,13 @@ int OxCsvFile::open(char const* filename, OxFile::OxIOType type) {
     char const* name = filename != nullptr ? filename : "";
     if (type == OxFile::OxIOInput) {
         delete input;
+        input = nullptr; // closed first, so that nothing holds the file
         input = new OxInput(name, OxFile::FILE_MODE_TEXT);
         return input->isGood() == OxTrue ? 0 : -1;
     }
     if (type == OxFile::OxIOOutput) {
         delete output;
+        output = nullptr; // closed first: the new output may replace the file
         output = new OxOutput(name, OxFile::FILE_MODE_TEXT);
         return output->isGood() == OxTrue ? 0 : -1;
     }
@@ -144,25 +150,32 @@ OxBool OxCsvFile::readFile() {
     if (size > UINT_MAX) {
         size = UINT_MAX;
     }
-    char* line = new (std::nothrow) char[size];
-    if (line == nullptr) {
-        std::cerr << "FATAL: Dynamic storage allocation failure." << std::endl;
+    unsigned int presetColumns = columnNames.getLength();
+    bool read = withMemory([&] {
+        std::unique_ptr<char[]> line(new char[size]);
+        bool headerDone = presetColumns > 0;
+        setRoot(new OxXmlElement("root"));
+        for (;;) {
+            line[0] = '\0';
+            OxBool more = input->getline(line.get(), static_cast<unsigned int>(size - 1), '\n');
+            // A last line without a line end (or the part of a line that did
+            // not fit) is still a line: take it before looking at why the
+            // read ended.
+            takeLine(line.get(), headerDone);
+            if (more != OxTrue) {
+                break;
+            }
+        }
+    });
+    if (!read) {
+        // No part of a table: the records and the columns of this read go.
+        reportNoMemory();
+        setRoot(nullptr);
+        while (columnNames.getLength() > presetColumns) {
+            delete[] columnNames[--columnNames.length];
+        }
         return OxFalse;
     }
-    bool headerDone = columnNames.getLength() > 0;
-    setRoot(new OxXmlElement("root"));
-
-    for (;;) {
-        line[0] = '\0';
-        OxBool more = input->getline(line, static_cast<unsigned int>(size - 1), '\n');
-        // A last line without a line end (or the part of a line that did not
-        // fit) is still a line: take it before looking at why the read ended.
-        takeLine(line, headerDone);
-        if (more != OxTrue) {
-            break;
-        }
-    }
-    delete[] line;
     if (input->eof() != OxTrue) {
         OxMsg::Log(OxMsgFileRead, nameOf(input));
         return OxFalse;
@@ -197,8 +210,9 @@ bool OxCsvFile::takeHeader(char* line) {
 }
 
 void OxCsvFile::takeRecord(char* line) {
-    OxXmlElement* record = new OxXmlElement("record");
-    root->addChild(record);
+    std::unique_ptr<OxXmlElement> made(new OxXmlElement("record"));
+    root->addChild(made.get());
+    OxXmlElement* record = made.release(); // the root has it
     record->setParent(root);
     // One attribute per non-empty field: count them, so that the record's
     // list is made once at its final size.
@@ -218,9 +232,9 @@ void OxCsvFile::takeRecord(char* line) {
                 generatedColumnName(generated, position);
                 name = generated;
             }
-            OxXmlAttribute* attribute = new OxXmlAttribute(name);
-            record->addAttribute(attribute);
-            attribute->setValue(start);
+            std::unique_ptr<OxXmlAttribute> attribute(new OxXmlAttribute(name));
+            record->addAttribute(attribute.get());
+            attribute.release()->setValue(start); // the record has it
         }
         position++;
     });
@@ -237,6 +251,19 @@ OxBool OxCsvFile::writeFile() {
         OxMsg::Log(OxMsgFileShortRead, nameOf(output));
         return OxFalse;
     }
+    bool written = withMemory([this] { writeLines(); });
+    if (!written) {
+        reportNoMemory(); // the lines sent so far stay in the file
+    }
+    // Every line went out through putline, whose results the format leaves
+    // unread; the stream stays failed after a failed line, so one flush at
+    // the end tells whether the whole table reached the file.
+    OxBool flushed = output->flush();
+    OxMsg::LogForce(OxMsgCsvWritten, nameOf(output));
+    return OxToBool(written && flushed == OxTrue);
+}
+
+void OxCsvFile::writeLines() {
     std::string text;
     unsigned int columns = columnNames.getLength();
     if (columns > 0) {
@@ -291,12 +318,6 @@ OxBool OxCsvFile::writeFile() {
         }
         output->putline(text.c_str());
     }
-    // Every line went out through putline, whose results the format leaves
-    // unread; the stream stays failed after a failed line, so one flush at
-    // the end tells whether the whole table reached the file.
-    OxBool flushed = output->flush();
-    OxMsg::LogForce(OxMsgCsvWritten, nameOf(output));
-    return flushed;
 }
 
 // ---------------------------------------------------------------------------

@@ -74,6 +74,8 @@ public:
     /// present one). OxFalse with no input or one that is not good, message 3
     /// when the rewind fails, message 2 when the input fails before its end.
     /// The input is left at its end, so a second call answers OxFalse.
+    /// Without memory: the fatal line on standard error, OxFalse, no root
+    /// and none of the column names this read found (no part of a table).
     OxBool readFile();
     /// Writes the header and one line per record from the start of the
     /// output, and logs message 578 (forced) with the file name. Values go
@@ -82,8 +84,9 @@ public:
     /// record) is padded with separators at its end. Without a root only the
     /// header is written. OxFalse with no output or one that is not good,
     /// message 3 when the rewind fails, and OxFalse too when the output failed
-    /// on the way (message 179): the output is flushed at the end, so a table
-    /// that did not reach the file whole is never answered OxTrue.
+    /// on the way (message 179) or memory ran out (the fatal line): the
+    /// output is flushed at the end, so a table that did not reach the file
+    /// whole is never answered OxTrue.
     OxBool writeFile();
 
     /// The tree or null; the object keeps it.
@@ -129,6 +132,8 @@ private:
     bool takeHeader(char* line);
     /// Creates a record under `root` from the fields of `line`.
     void takeRecord(char* line);
+    /// The lines of writeFile; std::bad_alloc reaches writeFile.
+    void writeLines();
 
     OxInput* input = nullptr;
     OxOutput* output = nullptr;

@@ -167,14 +167,15 @@ OxXmlAttribute::~OxXmlAttribute() {
 }
 
 void OxXmlAttribute::setValue(char const* text) {
+    char* copy = trimmedCopy(text); // first: without memory the value stays
     delete[] value;
-    value = nullptr;
-    value = trimmedCopy(text);
+    value = copy;
 }
 
 void OxXmlAttribute::storeFormatted() {
+    char* text = OxString::stripWhite(conversionPrt.flushToString());
     delete[] value;
-    value = OxString::stripWhite(conversionPrt.flushToString());
+    value = text;
 }
 
 template <class Text> void OxXmlAttribute::storeList(unsigned int count, Text text) {

@@ -41,7 +41,12 @@ template <class T> OxGList<T>* newList(unsigned int capacity) {
     if (memory == nullptr) {
         throw std::bad_alloc();
     }
-    return new (memory) OxGList<T>(capacity);
+    try {
+        return new (memory) OxGList<T>(capacity);
+    } catch (const std::bad_alloc&) {
+        listPool.release(memory); // no array for the list: its block goes back
+        throw;
+    }
 }
 
 /// Destroys a list made by newList (null is ignored).
@@ -253,9 +258,9 @@ void OxXmlElement::setName(char const* newName) {
 }
 
 void OxXmlElement::setValue(char const* newValue) {
+    char* copy = trimmedCopy(newValue); // first: without memory the value stays
     delete[] value;
-    value = nullptr;
-    value = trimmedCopy(newValue);
+    value = copy;
 }
 
 void OxXmlElement::adoptValue(char* newValue) {
@@ -269,9 +274,9 @@ void OxXmlElement::adoptValue(char* newValue) {
 }
 
 void OxXmlElement::setXsiType(char const* newType) {
+    char* copy = trimmedCopy(newType);
     delete[] xsiType;
-    xsiType = nullptr;
-    xsiType = trimmedCopy(newType);
+    xsiType = copy;
 }
 
 int OxXmlElement::readNumbers(char const* attributeName, double* numbers,

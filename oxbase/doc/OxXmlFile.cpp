@@ -1,6 +1,7 @@
 #include "oxbase/doc/OxXmlFile.h"
 
 #include "oxbase/core/OxString.h"
+#include "oxbase/core/detail/OxNoMemory.h"
 #include "oxbase/diag/OxMsg.h"
 #include "oxbase/diag/OxMsgNumbers.h"
 #include "oxbase/doc/detail/OxXmlReader.h"
@@ -12,6 +13,8 @@
 #include <cstring>
 #include <iostream>
 #include <new>
+
+using namespace oxbase::detail;
 
 char const* const OxXmlFile::OX_XML_UNKNOWN = "UNKNOWN";
 char const* const OxXmlFile::OX_XML_ASSIGNMENT = "=";
@@ -102,30 +105,21 @@ public:
         }
         return true;
     }
-    /// Hands the line to `output` and starts the next. False, with nothing
-    /// sent, when memory ran out while the line was built.
-    bool send(OxOutput& output) {
-        bool complete = !failed;
-        if (complete) {
-            output.putline(text.text());
-        }
+    /// Hands the line to `output` and starts the next.
+    void send(OxOutput& output) {
+        output.putline(text.text());
         discard();
-        return complete;
     }
     /// Drops the line in progress.
-    void discard() {
-        text.clear();
-        failed = false;
-    }
+    void discard() { text.clear(); }
 
 private:
     LineBuffer& add(char const* part, size_t count) {
-        failed = failed || !text.append(part, count);
+        text.append(part, count);
         return *this;
     }
 
     oxbase::detail::OxXmlTextBuffer text;
-    bool failed = false;
 };
 } // namespace
 
@@ -139,24 +133,35 @@ OxXmlFile::OxXmlFile(char const* filename, OxFile::OxIOType type) {
 OxXmlFile::~OxXmlFile() {
     delete input;
     delete output;
+    clearDocument();
+}
+
+void OxXmlFile::clearDocument() {
     delete root;
+    root = nullptr;
     delete declaration;
+    declaration = nullptr;
+    doctype = nullptr; // a node of the lists or of the tree
     for (unsigned int i = 0; i < preRootNodes.length; i++) {
         delete preRootNodes.data[i];
     }
+    preRootNodes.length = 0;
     for (unsigned int i = 0; i < postRootNodes.length; i++) {
         delete postRootNodes.data[i];
     }
+    postRootNodes.length = 0;
 }
 
 int OxXmlFile::open(char const* filename, OxFile::OxIOType type) {
     if (type == OxFile::OxIOInput) {
         delete input;
+        input = nullptr; // closed first, so that nothing holds the file
         input = new OxInput(filename, OxFile::FILE_MODE_TEXT);
         return input->isGood() ? 0 : -1;
     }
     if (type == OxFile::OxIOOutput) {
         delete output;
+        output = nullptr; // closed first: the new output may replace the file
         output = new OxOutput(filename, OxFile::FILE_MODE_TEXT);
         return output->isGood() ? 0 : -1;
     }
@@ -197,8 +202,16 @@ OxBool OxXmlFile::readFile() {
         OxMsg::Log(OxMsgFileShortRead, nameOrEmpty(input->getFilename()));
         return OxFalse;
     }
-    oxbase::detail::OxXmlReader reader(*this);
-    OxBool result = reader.run();
+    OxBool result = OxFalse;
+    if (!withMemory([&] {
+            oxbase::detail::OxXmlReader reader(*this);
+            result = reader.run();
+        })) {
+        // No part of a document: what was read before the failure goes.
+        reportNoMemory();
+        clearDocument();
+        return OxFalse;
+    }
     if (result && !input->isGood() && !input->eof()) {
         OxMsg::Log(OxMsgFileRead, nameOrEmpty(input->getFilename()));
         return OxFalse;
@@ -238,6 +251,22 @@ OxBool OxXmlFile::writeFile() {
         OxMsg::Log(OxMsgFileShortRead, nameOrEmpty(output->getFilename()));
         return OxFalse;
     }
+    OxBool result = OxFalse;
+    if (!withMemory([&] { result = writeDocument(); })) {
+        reportNoMemory(); // the lines sent so far stay in the file
+        result = OxFalse;
+    }
+    // A failed line does not stop the writer (putline reports it), but the
+    // stream stays failed, so the closing flush tells whether everything
+    // reached the file: a document that did not is never reported written.
+    if (output->flush() != OxTrue) {
+        result = OxFalse;
+    }
+    OxMsg::Log(OxMsgXmlWritten, nameOrEmpty(output->getFilename()));
+    return result;
+}
+
+OxBool OxXmlFile::writeDocument() {
     if (declaration != nullptr) {
         if (declaration->getValue() != nullptr) {
             output->putline(declaration->getValue());
@@ -270,13 +299,6 @@ OxBool OxXmlFile::writeFile() {
     for (unsigned int i = 0; i < postRootNodes.length; i++) {
         writeTopLevelNode(postRootNodes.data[i]);
     }
-    // A failed line does not stop the writer (putline reports it), but the
-    // stream stays failed, so the closing flush tells whether everything
-    // reached the file: a document that did not is never reported written.
-    if (output->flush() != OxTrue) {
-        result = OxFalse;
-    }
-    OxMsg::Log(OxMsgXmlWritten, nameOrEmpty(output->getFilename()));
     return result;
 }
 
@@ -324,7 +346,8 @@ OxBool OxXmlFile::write(OxXmlElement const* element) {
                 .add(OX_XML_NODE_END)
                 .add(node->getName())
                 .add(OX_XML_END);
-            return line.send(*output) ? Done : Failed;
+            line.send(*output);
+            return Done;
         }
         for (unsigned int i = 0; i < node->getNbAttributes(); i++) {
             OxXmlAttribute const* attribute = node->getAttribute(i);
@@ -335,12 +358,11 @@ OxBool OxXmlFile::write(OxXmlElement const* element) {
         }
         if (node->getNbChildElements() == 0) {
             line.add(OX_XML_NODE_END).add(OX_XML_END);
-            return line.send(*output) ? Done : Failed;
+            line.send(*output);
+            return Done;
         }
         line.add(OX_XML_END);
-        if (!line.send(*output)) {
-            return Failed;
-        }
+        line.send(*output);
         adjustIndent(1);
         stack.append(Frame{node, 0});
         return Opened;
@@ -362,9 +384,7 @@ OxBool OxXmlFile::write(OxXmlElement const* element) {
             .add(OX_XML_NODE_END)
             .add(top.element->getName())
             .add(OX_XML_END);
-        if (!line.send(*output)) {
-            return OxFalse;
-        }
+        line.send(*output);
         stack.length--;
     }
     return OxTrue;

@@ -97,17 +97,20 @@ public:
     OxXmlElement const* getRoot() const { return root; }
     OxXmlElement* getRootForUpdate() const { return root; }
 
-    /// Reads the document from the start of the input (see OxXmlFile.cpp for
-    /// the state machine). OxFalse on a syntax error (logged as 566 and the
-    /// error's number), with no input, or when the input is no longer good;
-    /// what was read until then stays in the document.
+    /// Reads the document from the start of the input (the state machine is
+    /// in doc/detail/OxXmlReader). OxFalse on a syntax error (logged as 566
+    /// and the error's number), with no input, or when the input is no
+    /// longer good; what was read until then stays in the document. Without
+    /// memory: the fatal line on standard error, OxFalse, and the document
+    /// holds nothing at all (no part of a tree).
     OxBool readFile();
     /// Writes the document from the start of the output: the declaration (a
     /// generated one followed by an empty line), the nodes before the root,
     /// the element tree one blank per level, the nodes behind the root; then
     /// logs 579. OxFalse with no good output or for a node that cannot be
-    /// written (no name and no value, an attribute without a name), a line
-    /// for which memory ran out (that line is not sent), or when the output
+    /// written (no name and no value, an attribute without a name), when
+    /// memory ran out (the fatal line on standard error; the lines sent so
+    /// far stay, the line in progress is not sent), or when the output
     /// failed on the way (its own message 179 tells): the output is flushed
     /// at the end, so a document that did not reach the file whole is never
     /// answered OxTrue.
@@ -136,6 +139,11 @@ private:
     OxBool write(OxXmlElement const* element);
     /// Writes a node of the lists before and behind the root.
     void writeTopLevelNode(OxXmlElement const* node);
+    /// The lines of writeFile, from the declaration to the last node behind
+    /// the root; std::bad_alloc reaches writeFile.
+    OxBool writeDocument();
+    /// Deletes the tree, the declaration and the nodes beside the root.
+    void clearDocument();
     static void moveIndent(short to);
 
     OxInput* input = nullptr;

@@ -16,7 +16,6 @@ using namespace oxbase::detail;
 // the lower fields in the first half and the upper ones in the second.
 namespace {
 constexpr double kFixedTolerance = 1e-5;
-using oxbase::detail::copyFields;
 
 template <class T, std::size_t K> void setEmptyMarkers(const std::array<T*, K>& fields) {
     for (std::size_t i = 0; i < K; i++) {

@@ -16,9 +16,6 @@ using namespace oxbase::detail;
 // OxRot and OxRot2d differ only in their dimension; the helpers below, and
 // those of OxGeomDetail.h, serve both through their row arrays.
 namespace {
-using oxbase::detail::copyMatrix;
-using oxbase::detail::scaleMatrix;
-using oxbase::detail::setIdentity;
 
 constexpr double kFixedTolerance = 1e-5;
 

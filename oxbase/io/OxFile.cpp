@@ -1,6 +1,7 @@
 #include "oxbase/io/OxFile.h"
 
 #include "oxbase/core/OxString.h"
+#include "oxbase/core/detail/OxKeepErrno.h"
 #include "oxbase/diag/OxMsg.h"
 #include "oxbase/diag/OxMsgNumbers.h"
 #include "oxbase/platform/detail/OxPlatformFs.h"
@@ -343,9 +344,10 @@ OxBool OxFile::mkdir(const char* path) {
     if (OxPlatformMkdir(path) == 0) {
         return OxTrue;
     }
-    int error = OxPlatformErrno();
-    OxMsg::Log(OxMsgDirectoryCreate, path);
-    OxPlatformSetErrno(error); // logging may have touched errno
+    {
+        OxKeepErrno keep; // logging may touch errno; perror reports the mkdir's
+        OxMsg::Log(OxMsgDirectoryCreate, path);
+    }
     OxPlatformPerror("System Error");
     return OxFalse;
 }
@@ -373,12 +375,11 @@ char* OxFile::getCWD(char* buffer, unsigned int size, unsigned int drive) {
     if (OxPlatformGetDriveCwd(buffer, limit, drive) != nullptr) {
         return buffer;
     }
-    int error = OxPlatformErrno();
-    OxMsg::Log(OxMsgCwdUnreadable, systemErrorText(error).c_str());
+    OxKeepErrno keep;
+    OxMsg::Log(OxMsgCwdUnreadable, systemErrorText(keep.value()).c_str());
     if (allocated) {
         delete[] buffer;
     }
-    OxPlatformSetErrno(error);
     return nullptr;
 }
 

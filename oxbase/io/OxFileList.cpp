@@ -2,12 +2,14 @@
 #include "oxbase/io/OxFileList.h"
 
 #include "oxbase/core/OxString.h"
+#include "oxbase/core/detail/OxNoMemory.h"
 #include "oxbase/platform/detail/OxPlatformFs.h"
 #include "oxbase/platform/detail/OxPlatformPath.h"
 
 #include <cctype>
 #include <cstring>
 #include <iostream>
+#include <memory>
 #include <string>
 
 using namespace oxbase::detail;
@@ -68,8 +70,9 @@ void OxFileList::addListFile(const char* name) {
 }
 
 void OxFileList::setListFilePath(const char* path) {
+    char* copy = OxString::dup(path);
     delete[] listFilePath;
-    listFilePath = OxString::dup(path);
+    listFilePath = copy;
 }
 
 OxBool OxFileList::isComment(const char* text) const {
@@ -108,11 +111,10 @@ char* OxFileList::stripComment(char* text) {
 }
 
 bool OxFileList::readListFile(const char* name) {
-    std::ifstream* in = OxPlatformOpenInput(name, false);
+    std::unique_ptr<std::ifstream> in(OxPlatformOpenInput(name, false));
     std::string second;
     if (!in->is_open() || !in->good()) {
-        delete in;
-        in = nullptr;
+        in.reset();
         if (listFilePath == nullptr) {
             std::cerr << "Unable to open list file.\n"
                       << "  Tried " << name << "\n"
@@ -120,9 +122,8 @@ bool OxFileList::readListFile(const char* name) {
             return false;
         }
         second = OxPlatformJoinPath(listFilePath, name);
-        in = OxPlatformOpenInput(second.c_str(), false);
+        in.reset(OxPlatformOpenInput(second.c_str(), false));
         if (!in->is_open() || !in->good()) {
-            delete in;
             std::cerr << "Unable to open list file.\n"
                       << "  Tried " << name << " and " << second << "\n"
                       << std::flush;
@@ -142,13 +143,20 @@ bool OxFileList::readListFile(const char* name) {
         }
         add(line);
     }
-    delete in;
     return true;
 }
 
 OxBool OxFileList::readListFiles() {
     for (unsigned int i = 0; i < listFiles.getLength(); i++) {
-        if (listFiles[i] != nullptr && !readListFile(listFiles[i])) {
+        bool read = false;
+        if (listFiles[i] == nullptr) {
+            continue;
+        }
+        if (!withMemory([&] { read = readListFile(listFiles[i]); })) {
+            reportNoMemory(); // the names read before stay, each whole
+            return OxFalse;
+        }
+        if (!read) {
             return OxFalse;
         }
     }

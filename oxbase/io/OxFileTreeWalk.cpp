@@ -1,6 +1,8 @@
 // OxFileTreeWalk.cpp: the walk, its ring of directory streams and parking.
 #include "oxbase/io/OxFileTreeWalk.h"
 
+#include "oxbase/core/detail/OxKeepErrno.h"
+#include "oxbase/core/detail/OxNoMemory.h"
 #include "oxbase/io/detail/OxDirStream.h"
 #include "oxbase/platform/detail/OxPlatformDir.h"
 #include "oxbase/platform/detail/OxPlatformPath.h"
@@ -17,18 +19,71 @@ namespace {
 
 const std::uint32_t startBufferSize = 260;
 
-/// The main debug line, flushed; errno comes through unchanged.
-void debugLine(const char* function, int line) {
-    int saved = errno;
-    std::cerr << function << ": returning -1 at line " << line << "\n" << std::flush;
-    errno = saved;
-}
+/// The places where a walk gives up or passes a directory over, each with
+/// the line number its debug text names.
+enum class Site {
+    RunNoPath,
+    RunEmptyPath,
+    RunNoMemory,
+    RunNoCwd,
+    LoopNoChdir,
+    Loop,
+    EntryNoMemory,
+    EntryStatus,
+    EntryChdirRoot,
+    EntryChdirBack,
+    ParkNoMemory,
+    ParkGrow,
+    ParkBlock,
+    OpenStream
+};
 
-/// The extra debug line: prefix ("cwd", "dirbuf", "buf") and the buffer's text.
-void debugBuffer(const char* prefix, const char* text) {
-    int saved = errno;
-    std::cerr << prefix << ": \"" << (text != nullptr ? text : "") << "\"\n" << std::flush;
-    errno = saved;
+struct DebugSite {
+    const char* function;
+    int line;
+    const char* buffer; ///< the name of the buffer of the extra line, or null
+};
+
+/// Indexed by Site.
+constexpr DebugSite kDebugSites[] = {
+    {"OxFileTreeWalk::run", 224, nullptr},
+    {"OxFileTreeWalk::run", 229, nullptr},
+    {"OxFileTreeWalk::run", 238, nullptr},
+    {"OxFileTreeWalk::run", 279, "cwd"},
+    {"OxFileTreeWalk::walkDir", 411, "dirbuf"},
+    {"OxFileTreeWalk::walkDir", 415, "dirbuf"},
+    {"OxFileTreeWalk::process_entry", 545, nullptr},
+    {"OxFileTreeWalk::process_entry", 564, "dirbuf"},
+    {"OxFileTreeWalk::process_entry", 601, nullptr},
+    {"OxFileTreeWalk::process_entry", 610, "dirbuf"},
+    {"OxFileTreeWalk::open_dir_stream", 653, nullptr},
+    {"OxFileTreeWalk::open_dir_stream", 677, "buf"},
+    {"OxFileTreeWalk::open_dir_stream", 709, "buf"},
+    {"OxFileTreeWalk::open_dir_stream", 736, "dirbuf"},
+};
+static_assert(sizeof kDebugSites / sizeof kDebugSites[0] == static_cast<int>(Site::OpenStream) + 1,
+              "one debug text for every site");
+
+/// The debug text of `site` on standard error, each line flushed: the main
+/// line ("<function>: returning -1 at line <n>") and, for a site with a
+/// buffer, the extra line with `text` between double quotes, which comes
+/// before the main line for "buf" and after it for the others. errno comes
+/// through unchanged.
+void debugText(Site site, const char* text = nullptr) {
+    OxKeepErrno keep;
+    const DebugSite& debug = kDebugSites[static_cast<int>(site)];
+    auto extra = [&] {
+        std::cerr << debug.buffer << ": \"" << (text != nullptr ? text : "") << "\"\n"
+                  << std::flush;
+    };
+    bool extraFirst = debug.buffer != nullptr && std::strcmp(debug.buffer, "buf") == 0;
+    if (extraFirst) {
+        extra();
+    }
+    std::cerr << debug.function << ": returning -1 at line " << debug.line << "\n" << std::flush;
+    if (debug.buffer != nullptr && !extraFirst) {
+        extra();
+    }
 }
 
 int callUser(OxFileTreeWalkCallback callback, const char* path, const OxStat* status,
@@ -46,12 +101,7 @@ OxFileTreeWalk::OxFileTreeWalk(const char* path, OxFileTreeWalkCallback function
                                int depth, void* data)
     : maxDepth(depth < 0 ? -1 : depth), maxStreams(streams < 1 ? 1u : std::size_t(streams)),
       startPath(path), callback(function), userData(data) {
-    dirStreams = new (std::nothrow) FileTreeWalkDir*[maxStreams];
-    if (dirStreams != nullptr) {
-        for (std::size_t i = 0; i < maxStreams; i++) {
-            dirStreams[i] = nullptr;
-        }
-    }
+    dirStreams = new FileTreeWalkDir*[maxStreams]();
 }
 
 OxFileTreeWalk::~OxFileTreeWalk() {
@@ -73,8 +123,8 @@ bool OxFileTreeWalk::growDirbuf(std::uint64_t needed) {
         errno = ENOMEM;
         return false;
     }
-    char* grown = new (std::nothrow) char[size];
-    if (grown == nullptr) {
+    char* grown = nullptr;
+    if (!withMemory([&] { grown = new char[size]; })) {
         errno = ENOMEM;
         return false;
     }
@@ -87,20 +137,24 @@ bool OxFileTreeWalk::growDirbuf(std::uint64_t needed) {
 
 int OxFileTreeWalk::run() {
     if (startPath == nullptr) {
-        debugLine("OxFileTreeWalk::run", 224);
+        debugText(Site::RunNoPath);
         return -1;
     }
     if (startPath[0] == '\0') {
-        debugLine("OxFileTreeWalk::run", 229);
+        debugText(Site::RunEmptyPath);
         return -1;
     }
     // The walk moves the working directory, so every path it forms must be
     // absolute: a relative start path is resolved against the directory of
     // the moment first.
     std::string absolute;
-    if (!OxPlatformMakeAbsolute(startPath, absolute)) {
-        debugLine("OxFileTreeWalk::run", 279);
-        debugBuffer("cwd", "");
+    bool madeAbsolute = false;
+    if (!withMemory([&] { madeAbsolute = OxPlatformMakeAbsolute(startPath, absolute); })) {
+        reportNoMemory();
+        return -1;
+    }
+    if (!madeAbsolute) {
+        debugText(Site::RunNoCwd, "");
         return -1;
     }
     // The start path is kept whole: the buffer holds at least 260 characters
@@ -108,11 +162,9 @@ int OxFileTreeWalk::run() {
     std::uint64_t needed = absolute.size() + 2;
     std::uint64_t size = needed < startBufferSize ? startBufferSize : needed;
     delete[] dirbuf;
-    dirbuf = size <= 0xFFFFFFFFull ? new (std::nothrow) char[size] : nullptr;
-    if (dirbuf == nullptr || dirStreams == nullptr) {
-        delete[] dirbuf;
-        dirbuf = nullptr;
-        debugLine("OxFileTreeWalk::run", 238);
+    dirbuf = nullptr;
+    if (size > 0xFFFFFFFFull || !withMemory([&] { dirbuf = new char[size]; })) {
+        debugText(Site::RunNoMemory);
         return -1;
     }
     dirbufSize = static_cast<std::uint32_t>(size);
@@ -141,9 +193,13 @@ int OxFileTreeWalk::run() {
     int result = -1;
     do {
         if (base > 0) {
-            if (!OxPlatformGetCwd(savedCwd)) {
-                debugLine("OxFileTreeWalk::run", 279);
-                debugBuffer("cwd", savedCwd.c_str());
+            bool cwdRead = false;
+            if (!withMemory([&] { cwdRead = OxPlatformGetCwd(savedCwd); })) {
+                reportNoMemory();
+                break;
+            }
+            if (!cwdRead) {
+                debugText(Site::RunNoCwd, savedCwd.c_str());
                 break;
             }
             cwdSaved = true;
@@ -175,14 +231,13 @@ int OxFileTreeWalk::run() {
         }
     } while (false);
 
-    int saved = errno;
+    OxKeepErrno keep; // the walk's own errno, not that of the tidying up
     if (cwdSaved) {
         OxPlatformChdir(savedCwd.c_str());
     }
     delete[] dirbuf;
     dirbuf = nullptr;
     dirbufSize = 0;
-    errno = saved;
     return result;
 }
 
@@ -190,10 +245,11 @@ void OxFileTreeWalk::closeStream(FileTreeWalkDir* dir) {
     if (dir->stream == nullptr) {
         return;
     }
-    int saved = errno;
-    OxDirStream::closedir(dir->stream);
+    {
+        OxKeepErrno keep;
+        OxDirStream::closedir(dir->stream);
+    }
     dir->stream = nullptr;
-    errno = saved;
     activeSlot = activeSlot == 0 ? maxStreams - 1 : activeSlot - 1;
     dirStreams[activeSlot] = nullptr;
 }
@@ -205,7 +261,12 @@ int OxFileTreeWalk::walkDir(OxStat* status) {
     if (inodes.exists(status) == OxTrue) {
         return 0;
     }
-    inodes.add(status);
+    // A directory that cannot be remembered could be entered again through
+    // a link: the walk ends rather than risk a loop.
+    if (!withMemory([&] { inodes.add(status); })) {
+        reportNoMemory();
+        return -1;
+    }
 
     if (open_dir_stream(&dir) != 0) {
         if (errno == EACCES) {
@@ -220,12 +281,7 @@ int OxFileTreeWalk::walkDir(OxStat* status) {
         return result;
     }
     if (errno == ELOOP) {
-        if (OxPlatformChdir(dirbuf) != 0) {
-            debugLine("OxFileTreeWalk::walkDir", 411);
-        } else {
-            debugLine("OxFileTreeWalk::walkDir", 415);
-        }
-        debugBuffer("dirbuf", dirbuf);
+        debugText(OxPlatformChdir(dirbuf) != 0 ? Site::LoopNoChdir : Site::Loop, dirbuf);
         closeStream(&dir);
         return -1;
     }
@@ -261,10 +317,9 @@ int OxFileTreeWalk::walkDir(OxStat* status) {
         }
     }
     if (dir.content != nullptr) {
-        int saved = errno;
+        OxKeepErrno keep;
         delete[] dir.content;
         dir.content = nullptr;
-        errno = saved;
     }
 
     dirbuf[cut] = '\0';
@@ -279,7 +334,7 @@ int OxFileTreeWalk::process_entry(FileTreeWalkDir* dir, const char* name, std::s
     }
     std::uint64_t needed = static_cast<std::uint64_t>(base) + length + 2;
     if (dirbufSize < needed && !growDirbuf(needed)) {
-        debugLine("OxFileTreeWalk::process_entry", 545);
+        debugText(Site::EntryNoMemory);
         return -1;
     }
     std::memcpy(dirbuf + base, name, length);
@@ -296,8 +351,7 @@ int OxFileTreeWalk::process_entry(FileTreeWalkDir* dir, const char* name, std::s
         if (errno == EACCES || errno == ENOENT) {
             return 0; // gone or hidden since the listing: passed over
         }
-        debugLine("OxFileTreeWalk::process_entry", 564);
-        debugBuffer("dirbuf", dirbuf);
+        debugText(Site::EntryStatus, dirbuf);
         return -1;
     }
     if (!OxPlatformIsDirectoryMode(status)) {
@@ -313,7 +367,7 @@ int OxFileTreeWalk::process_entry(FileTreeWalkDir* dir, const char* name, std::s
     // Back to the directory whose entries are being read.
     if (base == 1) {
         if (OxPlatformChdir("/") != 0) {
-            debugLine("OxFileTreeWalk::process_entry", 601);
+            debugText(Site::EntryChdirRoot);
             return -1;
         }
     } else {
@@ -321,8 +375,7 @@ int OxFileTreeWalk::process_entry(FileTreeWalkDir* dir, const char* name, std::s
         dirbuf[base - 1] = '\0';
         int changed = OxPlatformChdir(dirbuf);
         if (changed != 0) {
-            debugLine("OxFileTreeWalk::process_entry", 610);
-            debugBuffer("dirbuf", dirbuf);
+            debugText(Site::EntryChdirBack, dirbuf);
         }
         dirbuf[base - 1] = kept;
         if (changed != 0) {
@@ -338,9 +391,9 @@ int OxFileTreeWalk::open_dir_stream(FileTreeWalkDir* dir) {
         // The ring is full and this is its oldest stream: read the rest of
         // its directory into memory and give its slot up.
         std::size_t bufferSize = 1024;
-        char* buf = new (std::nothrow) char[bufferSize];
-        if (buf == nullptr) {
-            debugLine("OxFileTreeWalk::open_dir_stream", 653);
+        char* buf = nullptr;
+        if (!withMemory([&] { buf = new char[bufferSize]; })) {
+            debugText(Site::ParkNoMemory);
             errno = ENOMEM;
             return -1;
         }
@@ -350,10 +403,9 @@ int OxFileTreeWalk::open_dir_stream(FileTreeWalkDir* dir) {
             std::size_t length = std::strlen(entry->d_name);
             while (used + length + 2 >= bufferSize) {
                 std::size_t grownSize = bufferSize + (2 * length < 1024 ? 1024 : length);
-                char* grown = new (std::nothrow) char[grownSize];
-                if (grown == nullptr) {
-                    debugBuffer("buf", buf);
-                    debugLine("OxFileTreeWalk::open_dir_stream", 677);
+                char* grown = nullptr;
+                if (!withMemory([&] { grown = new char[grownSize]; })) {
+                    debugText(Site::ParkGrow, buf);
                     delete[] buf;
                     errno = ENOMEM;
                     return -1;
@@ -368,10 +420,9 @@ int OxFileTreeWalk::open_dir_stream(FileTreeWalkDir* dir) {
             buf[used] = '\0';
         }
         buf[used++] = '\0';
-        char* block = new (std::nothrow) char[used];
-        if (block == nullptr) {
-            debugBuffer("buf", buf);
-            debugLine("OxFileTreeWalk::open_dir_stream", 709);
+        char* block = nullptr;
+        if (!withMemory([&] { block = new char[used]; })) {
+            debugText(Site::ParkBlock, buf);
             delete[] buf;
             errno = ENOMEM;
             return -1;
@@ -379,17 +430,17 @@ int OxFileTreeWalk::open_dir_stream(FileTreeWalkDir* dir) {
         std::memcpy(block, buf, used);
         delete[] buf;
         occupant->content = block;
-        int saved = errno;
-        OxDirStream::closedir(occupant->stream);
-        errno = saved;
+        {
+            OxKeepErrno keep;
+            OxDirStream::closedir(occupant->stream);
+        }
         occupant->stream = nullptr;
         dirStreams[activeSlot] = nullptr;
     }
 
     OxDirStream* stream = OxDirStream::opendir(dirbuf);
     if (stream == nullptr) {
-        debugLine("OxFileTreeWalk::open_dir_stream", 736);
-        debugBuffer("dirbuf", dirbuf);
+        debugText(Site::OpenStream, dirbuf);
         return -1;
     }
     dir->stream = stream;

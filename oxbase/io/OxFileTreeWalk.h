@@ -7,9 +7,13 @@
 // its end into memory and its stream closed. An inode table keeps the walk
 // from entering a directory twice, so links to ancestors cause no loop.
 //
-//   int count(const char * path, const OxStat *, OxFileTreeWalkType, void * n) { ++*(int *)n;
-//   return 0; } int n = 0; OxFileTreeWalk walk("/data/parts", count, 10, &n); int result =
-//   walk.run();    // 0, the callback's non-zero result, or -1
+//   int count(const char *, const OxStat *, OxFileTreeWalkType, void * n) {
+//       ++*static_cast<int *>(n);
+//       return 0;
+//   }
+//   int n = 0;
+//   OxFileTreeWalk walk("/data/parts", count, 10, &n);
+//   int result = walk.run();    // 0, the callback's non-zero result, or -1
 //
 // The walk moves the working directory of the process while it runs and
 // restores it at the end; it is for one thread at a time. Failures are
@@ -70,6 +74,9 @@ public:
     /// result when it stopped the walk, -1 on failure. The working directory
     /// is the same afterwards as before. An object serves one run: its inode
     /// table is not cleared, so a second run finds its directories known.
+    /// Memory: a buffer that cannot grow gives its debug text and -1; a
+    /// directory that cannot be remembered in the inode table ends the walk
+    /// with the fatal line on standard error and -1.
     int run();
 
     int getMaxDepth() const { return maxDepth; }

@@ -158,6 +158,7 @@ OxBool OxInodeTable::add(const OxStat* status) {
     }
     OxInodeDevice* device = find(status);
     if (device == nullptr) {
+        devices.reserve(devices.length + 1); // the room first: append cannot fail then
         device = new OxInodeDevice(OxPlatformStatDevice(*status));
         devices.append(device);
     }

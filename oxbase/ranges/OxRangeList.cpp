@@ -2,14 +2,18 @@
 #include "oxbase/ranges/OxRangeList.h"
 
 #include "oxbase/core/OxString.h"
+#include "oxbase/core/detail/OxNoMemory.h"
 #include "oxbase/diag/OxMsg.h"
 #include "oxbase/diag/OxMsgNumbers.h"
 
 #include <algorithm>
 #include <cctype>
+#include <memory>
 #include <new>
 #include <string>
 #include <vector>
+
+using namespace oxbase::detail;
 
 namespace {
 
@@ -50,16 +54,23 @@ OxRangeList::OxRangeList(OxGList<unsigned int>& numbers, char const* typeName) {
     numbers.removeDuplicates();
     std::string text;
     unsigned int count = numbers.getLength();
-    unsigned int i = 0;
-    while (i < count) {
-        unsigned int first = numbers[i];
-        unsigned int last = first;
-        // Sorted and unique, so a run goes on while each is one above the last.
-        while (i + 1 < count && last != ~0u && numbers[i + 1] == last + 1) {
-            last = numbers[++i];
+    bool spelled = withMemory([&] {
+        unsigned int i = 0;
+        while (i < count) {
+            unsigned int first = numbers[i];
+            unsigned int last = first;
+            // Sorted and unique: a run goes on while each is one above the last.
+            while (i + 1 < count && last != ~0u && numbers[i + 1] == last + 1) {
+                last = numbers[++i];
+            }
+            appendRange(text, first, last);
+            i++;
         }
-        appendRange(text, first, last);
-        i++;
+    });
+    if (!spelled) {
+        OxMsg::Log(OxMsgNoMemory, recordTypeName);
+        valid = OxFalse;
+        return;
     }
     if (text.empty()) {
         valid = OxTrue; // no numbers: a valid set with no members
@@ -97,12 +108,29 @@ OxBool OxRangeList::insert(OxRangeListRecord* record) {
 }
 
 OxBool OxRangeList::build(char const* text, char const* typeName) {
+    OxBool result = OxFalse;
+    if (!withMemory([&] { result = parse(text, typeName); })) {
+        // No memory for a record, the list or the working copy: no list at
+        // all rather than part of one.
+        OxMsg::Log(OxMsgNoMemory, recordTypeName);
+        releaseRecords();
+        releaseTree();
+        valid = OxFalse;
+        compacted = OxFalse;
+        return OxFalse;
+    }
+    return result;
+}
+
+OxBool OxRangeList::parse(char const* text, char const* typeName) {
     compacted = OxFalse;
     forgetWalk();
     if (typeName == nullptr) {
         typeName = "integer";
     }
-    char* copy = OxString::dup(text); // null for a null or empty text
+    // A working copy, null for a null or empty text.
+    std::unique_ptr<char[]> owned(OxString::dup(text));
+    char* copy = owned.get();
     if (copy == nullptr) {
         valid = OxFalse;
         return OxFalse;
@@ -120,21 +148,14 @@ OxBool OxRangeList::build(char const* text, char const* typeName) {
         OxMsg::Log(OxMsgRangeSyntax, typeName, at + 1, copy);
         failed = true;
     };
-    // Stores first..last; false (after the message) when it cannot be.
+    // Stores first..last; false (after the message) when it runs backwards.
     auto store = [&]() {
-        auto* record = new (std::nothrow) OxRangeListRecord;
-        if (record == nullptr) {
-            OxMsg::Log(OxMsgNoMemory, recordTypeName);
-            return false;
-        }
         if (last < first) {
             OxMsg::Log(OxMsgRangeBackwards, typeName, first, last);
-            delete record;
             return false;
         }
-        record->first = first;
-        record->last = last;
-        insert(record);
+        reserve(length + 1); // the room first: the insert cannot fail then
+        insert(new OxRangeListRecord{first, last});
         return true;
     };
 
@@ -214,8 +235,6 @@ OxBool OxRangeList::build(char const* text, char const* typeName) {
             break;
         }
     }
-    delete[] copy;
-
     if (failed) {
         releaseRecords();
         releaseTree();
@@ -266,15 +285,15 @@ void OxRangeList::compact() {
 
 void OxRangeList::merge(OxRangeList& other) {
     unsigned int count = other.getLength(); // fixed before appending (self-merge)
-    for (unsigned int i = 0; i < count; i++) {
-        const OxRangeListRecord* source = other.data[i];
-        auto* copy = new (std::nothrow) OxRangeListRecord;
-        if (copy == nullptr) {
-            continue;
+    bool copied = withMemory([&] {
+        reserve(length + count); // the room first: no insert can fail then
+        for (unsigned int i = 0; i < count; i++) {
+            const OxRangeListRecord* source = other.data[i];
+            insert(new OxRangeListRecord{source->first, source->last});
         }
-        copy->first = source->first;
-        copy->last = source->last;
-        insert(copy);
+    });
+    if (!copied) {
+        OxMsg::Log(OxMsgNoMemory, recordTypeName); // the ranges merged so far stay
     }
     compact();
 }
@@ -285,54 +304,50 @@ OxBool OxRangeList::negate(unsigned int from, unsigned int to) {
     }
     compact();
 
-    // Every new record is made before the list is touched, so a failure
-    // leaves it as it was.
-    std::vector<OxRangeListRecord*> pieces;
-    bool failed = false;
+    // Every new record is made, and room for them in the list, before the
+    // list is touched, so a failure leaves it as it was.
+    std::vector<std::unique_ptr<OxRangeListRecord>> pieces;
     auto add = [&](unsigned int first, unsigned int last) {
-        auto* record = new (std::nothrow) OxRangeListRecord;
-        if (record == nullptr) {
-            failed = true;
-            return;
-        }
-        record->first = first;
-        record->last = last;
-        pieces.push_back(record);
+        pieces.push_back(std::make_unique<OxRangeListRecord>(OxRangeListRecord{first, last}));
     };
-
-    if (length == 0) {
-        add(from, to);
-    } else {
-        unsigned int lowest = data[0]->first;
-        unsigned int highest = data[length - 1]->last;
-        if (from < lowest) {
-            add(from, lowest - 1);
-        }
-        // Touching records ("1-3,4-6") stay apart in a compact list and have
-        // no gap between them.
-        for (unsigned int i = 0; i + 1 < length && !failed; i++) {
-            unsigned int gapFirst = data[i]->last + 1;
-            unsigned int gapLast = data[i + 1]->first - 1;
-            if (gapFirst <= gapLast) {
-                add(gapFirst, gapLast);
+    bool made = withMemory([&] {
+        if (length == 0) {
+            add(from, to);
+        } else {
+            unsigned int lowest = data[0]->first;
+            unsigned int highest = data[length - 1]->last;
+            if (from < lowest) {
+                add(from, lowest - 1);
+            }
+            // Touching records ("1-3,4-6") stay apart in a compact list and
+            // have no gap between them.
+            for (unsigned int i = 0; i + 1 < length; i++) {
+                unsigned int gapFirst = data[i]->last + 1;
+                unsigned int gapLast = data[i + 1]->first - 1;
+                if (gapFirst <= gapLast) {
+                    add(gapFirst, gapLast);
+                }
+            }
+            if (highest < to) {
+                add(highest + 1, to);
             }
         }
-        if (!failed && highest < to) {
-            add(highest + 1, to);
-        }
-    }
-    if (failed) {
-        OxMsg::Log(OxMsgNoMemory, recordTypeName);
-        for (OxRangeListRecord* record : pieces) {
-            delete record;
-        }
+        reserve(static_cast<unsigned int>(pieces.size()));
+    });
+    if (!made) {
+        OxMsg::Log(OxMsgNoMemory, recordTypeName); // the pieces go with the vector
         return OxFalse;
     }
 
-    releaseRecords();
+    // The old records go, the array stays: it has room for the pieces.
+    for (unsigned int i = 0; i < length; i++) {
+        delete data[i];
+    }
+    length = 0;
+    forgetWalk();
     releaseTree();
-    for (OxRangeListRecord* record : pieces) {
-        append(record);
+    for (auto& record : pieces) {
+        append(record.release());
     }
     compacted = OxTrue;
     return OxTrue;

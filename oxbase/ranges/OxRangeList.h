@@ -69,7 +69,8 @@ public:
     /// "1-3,4-6" stays two records, "1-3,3-6" becomes "1-6".
     void compact();
     /// Appends a copy of each record of `other` (which stays unchanged), then
-    /// compacts. A copy that cannot be allocated is left out.
+    /// compacts. Without memory for a copy the merge stops there, with
+    /// message 228; what was merged before stays.
     void merge(OxRangeList& other);
     /// Replaces the list by the numbers of `from`..`to` it does not hold: the
     /// gaps between its records, whole, plus the piece from `from` up to the
@@ -96,7 +97,10 @@ public:
 
 protected:
     /// Parses `text` and appends its records; see the text constructor.
+    /// Without memory: message 228, and the list is left empty and invalid.
     OxBool build(char const* text, char const* typeName);
+    /// The work of build; std::bad_alloc reaches build.
+    OxBool parse(char const* text, char const* typeName);
     /// Whether the records are known to be sorted and without overlap.
     OxBool isCompact() const { return compacted; }
 

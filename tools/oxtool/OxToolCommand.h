@@ -5,7 +5,7 @@
 // file:
 //
 //   static int runPaths(int argc, char** argv) { ... }
-//   static OxToolRegistration reg{"paths", "PATH...", "show the path operations", runPaths};
+//   static OxToolRegistration reg{{"paths", "PATH...", "show the path operations", runPaths}};
 //
 // A command may also add a step to `oxtool demo`, which runs every step over
 // the bundled sample data, in the order of their `demoOrder`.

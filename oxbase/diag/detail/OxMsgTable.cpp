@@ -39,7 +39,9 @@ struct OxMsgTable::Block {
     Block* next;
 };
 
-OxMsgTable::OxMsgTable(OxGList<OxMsgRecord_s*>& list) : records(list) {}
+OxMsgTable::OxMsgTable(OxGList<OxMsgRecord_s*>& list) : records(list) {
+    runs.reserve(64); // one run for each bit of a count: never more
+}
 
 OxMsgTable::~OxMsgTable() {
     for (unsigned int i = 0; i < records.length; i++) {
@@ -49,7 +51,7 @@ OxMsgTable::~OxMsgTable() {
     records.makeEmpty();
     while (blocks != nullptr) {
         Block* next = blocks->next;
-        ::operator delete(blocks, std::nothrow);
+        delete[] reinterpret_cast<char*>(blocks);
         blocks = next;
     }
 }
@@ -87,26 +89,30 @@ bool OxMsgTable::mayKnow(unsigned int number) const {
     return (filter[bit / 64] >> (bit % 64) & 1u) != 0;
 }
 
-void OxMsgTable::remember(unsigned int number) {
+void OxMsgTable::growFilter(std::size_t numbers) {
     std::size_t bits = filter.size() * 64;
-    if (bits < entries.size() * kFilterBitsPerNumber) {
-        std::size_t grown = bits == 0 ? 1024 : bits;
-        while (grown < entries.size() * kFilterBitsPerNumber * 2) {
-            grown *= 2;
-        }
-        filter.assign(grown / 64, 0);
-        for (const Entry& entry : entries) {
-            std::size_t at = filterBit(entry.number, grown);
-            filter[at / 64] |= std::uint64_t(1) << (at % 64);
-        }
-        bits = grown;
+    if (bits >= numbers * kFilterBitsPerNumber) {
+        return;
     }
-    std::size_t at = filterBit(number, bits);
+    std::size_t grown = bits == 0 ? 1024 : bits;
+    while (grown < numbers * kFilterBitsPerNumber * 2) {
+        grown *= 2;
+    }
+    std::vector<std::uint64_t> rebuilt(grown / 64, 0);
+    for (const Entry& entry : entries) {
+        std::size_t at = filterBit(entry.number, grown);
+        rebuilt[at / 64] |= std::uint64_t(1) << (at % 64);
+    }
+    filter.swap(rebuilt);
+}
+
+void OxMsgTable::setFilterBit(unsigned int number) {
+    std::size_t at = filterBit(number, filter.size() * 64);
     filter[at / 64] |= std::uint64_t(1) << (at % 64);
 }
 
 void OxMsgTable::insert(Entry entry) {
-    entries.push_back(entry);
+    entries.push_back(entry); // within the capacity add made sure of
     std::size_t size = 1;
     while (!runs.empty() && runs.back() == size) {
         // Two runs of one size become one of twice the size. inplace_merge
@@ -117,7 +123,7 @@ void OxMsgTable::insert(Entry entry) {
         runs.pop_back();
         size *= 2;
     }
-    runs.push_back(size);
+    runs.push_back(size); // within the capacity reserved at construction
 }
 
 void OxMsgTable::mergeRuns() {
@@ -136,12 +142,9 @@ char* OxMsgTable::store(const char* text, std::size_t length) {
     std::size_t need = length + 1;
     if (need > unusedSize) {
         std::size_t size = need > kBlockSize / 4 ? need : kBlockSize;
-        void* memory = ::operator new(sizeof(Block) + size, std::nothrow);
-        if (memory == nullptr) {
-            return nullptr;
-        }
-        Block* block = static_cast<Block*>(memory);
-        char* data = static_cast<char*>(memory) + sizeof(Block);
+        char* memory = new char[sizeof(Block) + size];
+        Block* block = reinterpret_cast<Block*>(memory);
+        char* data = memory + sizeof(Block);
         if (size == need && blocks != nullptr) {
             // A text of its own block goes behind the newest, which keeps
             // its free part for the short texts that follow.
@@ -164,31 +167,28 @@ char* OxMsgTable::store(const char* text, std::size_t length) {
     return copy;
 }
 
-bool OxMsgTable::add(unsigned int number, std::uint32_t type, std::int32_t level,
+void OxMsgTable::add(unsigned int number, std::uint32_t type, std::int32_t level,
                      const char* text) {
+    // Every allocation comes first; what follows cannot fail, so a record
+    // is in the list and the index, or nowhere.
+    records.reserve(records.length + 1);
+    if (entries.size() == entries.capacity()) {
+        entries.reserve(entries.empty() ? 64 : 2 * entries.size());
+    }
+    growFilter(entries.size() + 1);
+    char* stored = store(text, std::strlen(text));
     void* memory = recordPool.allocate();
     if (memory == nullptr) {
-        return false;
+        throw std::bad_alloc();
     }
     auto* record = new (memory) OxMsgRecord_s;
     record->type = type;
     record->level = level;
-    record->text = store(text, std::strlen(text));
-    unsigned int position = records.length;
-    if (record->text == nullptr) {
-        recordPool.release(record);
-        return false;
-    }
-    try {
-        records.append(record);
-        insert(Entry{number, position});
-        remember(number);
-    } catch (const std::bad_alloc&) {
-        records.length = position;
-        recordPool.release(record);
-        return false;
-    }
-    return true;
+    record->text = stored;
+    std::uint32_t position = records.length;
+    records.append(record);
+    insert(Entry{number, position});
+    setFilterBit(number);
 }
 
 bool OxMsgTable::continueText(unsigned int number, const char* text) {
@@ -196,39 +196,34 @@ bool OxMsgTable::continueText(unsigned int number, const char* text) {
     if (position < 0) {
         return false;
     }
-    try {
-        auto found = joined.find(static_cast<std::uint32_t>(position));
-        if (found == joined.end()) {
-            const char* first = records.data[position]->text;
-            found = joined
-                        .emplace(static_cast<std::uint32_t>(position),
-                                 std::string(first != nullptr ? first : ""))
-                        .first;
-        }
-        found->second.append("\n\t").append(text);
-    } catch (const std::bad_alloc&) {
-        return false;
+    auto found = joined.find(static_cast<std::uint32_t>(position));
+    if (found == joined.end()) {
+        const char* first = records.data[position]->text;
+        found = joined
+                    .emplace(static_cast<std::uint32_t>(position),
+                             std::string(first != nullptr ? first : ""))
+                    .first;
     }
+    found->second.append("\n\t").append(text);
     return true;
 }
 
-bool OxMsgTable::finish() {
-    bool complete = true;
+void OxMsgTable::finish() {
     mergeRuns();
     // Texts that continuation lines made longer, then every text of this
-    // load, in file order: a %n is made harmless wherever it stands.
+    // load, in file order: a %n is made harmless wherever it stands. The
+    // joined texts are forgotten on every road out, so that a load cut short
+    // leaves nothing half-joined for the next one.
+    struct Forget {
+        std::unordered_map<std::uint32_t, std::string>& texts;
+        ~Forget() { texts.clear(); }
+    } forget{joined};
     for (auto& [position, text] : joined) {
-        char* stored = store(text.data(), text.size());
-        if (stored == nullptr) {
-            complete = false;
-            continue;
-        }
-        records.data[position]->text = stored;
+        records.data[position]->text = store(text.data(), text.size());
         if (position < firstUnchecked) {
             disarm(position);
         }
     }
-    joined.clear();
     for (std::uint32_t position = firstUnchecked; position < records.length; position++) {
         disarm(position);
     }
@@ -237,10 +232,9 @@ bool OxMsgTable::finish() {
     for (unsigned int i = 0, number; (number = OxMsgLibraryNumber(i)) != 0; i++) {
         OxMsgRecord_s* record = find(number);
         if (record != nullptr) {
-            complete = checkArguments(number, record) && complete;
+            checkArguments(number, record);
         }
     }
-    return complete;
 }
 
 std::uint32_t OxMsgTable::numberAt(std::uint32_t position) const {
@@ -260,30 +254,28 @@ void OxMsgTable::disarm(std::uint32_t position) {
     }
 }
 
-bool OxMsgTable::checkArguments(unsigned int number, OxMsgRecord_s* record) {
+void OxMsgTable::checkArguments(unsigned int number, OxMsgRecord_s* record) {
     const char* arguments = OxMsgLibraryArguments(number);
     if (OxMsgFormatFits(record->text, arguments)) {
-        return true;
+        return;
     }
     std::cerr << " Message " << number
               << ": its text does not fit the arguments the library passes; a safe text is "
                  "used.\n"
               << std::flush;
-    // "Message 566: %s %u %u %s" shows what the library passed. Built in a
-    // fixed buffer: nothing here may fail but the store.
+    // "Message 566: %s %u %u %s" shows what the library passed.
     char safe[64];
     int length = std::snprintf(safe, sizeof safe, "Message %u:", number);
     for (const char* kind = arguments; *kind != '\0' && length + 3 < int(sizeof safe); kind++) {
         length += std::snprintf(safe + length, sizeof safe - static_cast<std::size_t>(length),
                                 *kind == 's' ? " %%s" : " %%u");
     }
-    char* text = store(safe, static_cast<std::size_t>(length));
-    if (text == nullptr) {
+    try {
+        record->text = store(safe, static_cast<std::size_t>(length));
+    } catch (const std::bad_alloc&) {
         record->text[0] = '\0'; // no conversion at all reads nothing
-        return false;
+        throw;
     }
-    record->text = text;
-    return true;
 }
 
 } // namespace detail

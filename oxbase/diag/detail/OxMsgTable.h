@@ -45,13 +45,13 @@ public:
     bool knows(unsigned int number) const;
 
     /// A new record for `number`, which the table does not know, with a copy
-    /// of `text`, appended to the list. False when memory ran out; the table
-    /// is then as it was.
-    bool add(unsigned int number, std::uint32_t type, std::int32_t level, const char* text);
+    /// of `text`, appended to the list. Without memory std::bad_alloc
+    /// reaches the caller and the table is as it was.
+    void add(unsigned int number, std::uint32_t type, std::int32_t level, const char* text);
     /// Joins "\n\t" and `text` to the text of the known `number`. The joined
     /// text is kept aside and stored at its size by `finish`, so that a long
-    /// run of continuation lines costs linear time. False when memory ran
-    /// out or the number is unknown.
+    /// run of continuation lines costs linear time. False when the number is
+    /// unknown; std::bad_alloc without memory, the record unchanged.
     bool continueText(unsigned int number, const char* text);
 
     /// Ends a load: stores the joined texts, then checks every text added or
@@ -59,9 +59,9 @@ public:
     /// OxMsgFormatDisarm); a text of a number the library logs that does not
     /// fit its arguments (OxMsgLibraryArguments) is replaced by a safe text
     /// that shows the arguments, "Message 566: %s %u %u %s". Each of these is
-    /// reported on standard error. False when memory ran out for a text; the
-    /// record then keeps its first line.
-    bool finish();
+    /// reported on standard error. Without memory std::bad_alloc reaches the
+    /// caller; a text that was to be replaced is then empty, never unsafe.
+    void finish();
 
 private:
     struct Entry {
@@ -79,26 +79,26 @@ private:
     /// bits a number, hashed). It spares a search of every run for the new
     /// numbers of a load, which are most of them.
     bool mayKnow(unsigned int number) const;
-    /// Sets the filter bit of `number`; rebuilds the filter at twice the
-    /// size when the table outgrew it.
-    void remember(unsigned int number);
+    /// Makes the filter large enough for `numbers` numbers (rebuilt at
+    /// twice the size when the table outgrew it).
+    void growFilter(std::size_t numbers);
+    /// Sets the filter bit of `number`.
+    void setFilterBit(unsigned int number);
 
     /// The position of `number` in the list, or -1.
     long long locate(unsigned int number) const;
     void insert(Entry entry);
     /// Merges the runs into one: a search is then one halving.
     void mergeRuns();
-    /// A copy of `length` bytes of `text` and a NUL in the text blocks; null
-    /// when memory ran out.
+    /// A copy of `length` bytes of `text` and a NUL in the text blocks.
     char* store(const char* text, std::size_t length);
     /// The number of the record at list `position` (a scan: for reports).
     std::uint32_t numberAt(std::uint32_t position) const;
     /// Disarms %n in the text at list `position`, reporting on standard error.
     void disarm(std::uint32_t position);
     /// Replaces the text of `record`, a record of a number the library logs,
-    /// when it does not fit the arguments the library passes. False when
-    /// memory ran out for the safe text.
-    bool checkArguments(unsigned int number, OxMsgRecord_s* record);
+    /// when it does not fit the arguments the library passes.
+    void checkArguments(unsigned int number, OxMsgRecord_s* record);
 
     OxGList<OxMsgRecord_s*>& records;
     std::vector<Entry> entries;       ///< sorted runs, largest first

@@ -1,5 +1,7 @@
 // OxXmlLineSource.h: the lines of a text-mode input, whole, for the XML reader.
 //
+// Without memory std::bad_alloc reaches the reader's caller (readFile).
+//
 //   OxXmlLineSource source(input);
 //   source.start(input.getFileLength());
 //   while (source.next(line, length) == OxXmlLineSource::Line) use(line, length);
@@ -10,7 +12,6 @@
 
 #include <cstddef>
 #include <cstring>
-#include <new>
 
 namespace oxbase {
 namespace detail {
@@ -28,14 +29,13 @@ public:
     OxXmlLineSource& operator=(const OxXmlLineSource&) = delete;
     ~OxXmlLineSource() { delete[] buffer; }
 
-    enum Result { Line, End, ReadFailure, NoMemory };
+    enum Result { Line, End, ReadFailure };
 
     /// Prepares to read `length` bytes from the current position.
-    bool start(long long length) {
+    void start(long long length) {
         remaining = length > 0 ? length : 0;
         capacity = kInitialCapacity;
-        buffer = new (std::nothrow) char[capacity];
-        return buffer != nullptr;
+        buffer = new char[capacity];
     }
 
     /// The next line without its line end, in place: `line` and `length`.
@@ -80,10 +80,7 @@ private:
             lineStart = 0;
         }
         if (capacity - 1 - filled < kMinimumRead) {
-            char* bigger = new (std::nothrow) char[capacity * 2];
-            if (bigger == nullptr) {
-                return NoMemory;
-            }
+            char* bigger = new char[capacity * 2];
             std::memcpy(bigger, buffer, filled);
             delete[] buffer;
             buffer = bigger;

@@ -3,6 +3,7 @@
 #include <cctype>
 #include <cstdint>
 #include <cstring>
+#include <memory>
 #include <new>
 
 namespace oxbase {
@@ -93,11 +94,13 @@ char const* OxXmlNames::acquire(char const* text) {
             return entry->text();
         }
     }
+    // The entry first, the table's growth second: without memory for either,
+    // the table stays as it was.
+    std::unique_ptr<char[]> memory(new char[sizeof(NameEntry) + length + 1]);
     if (2 * (table.used + 1) > table.capacity) {
         resize(table.capacity == 0 ? kFirstCapacity : 2 * table.capacity);
     }
-    char* memory = new char[sizeof(NameEntry) + length + 1];
-    auto* entry = new (memory) NameEntry{1, hash, length};
+    auto* entry = new (memory.release()) NameEntry{1, hash, length};
     std::memcpy(entry->text(), text, length);
     entry->text()[length] = '\0';
     placeEntry(table.slots, table.capacity, entry);

@@ -10,16 +10,13 @@
 #include <cctype>
 #include <cstring>
 #include <iostream>
-#include <new>
+#include <memory>
 
 namespace oxbase {
 namespace detail {
 
 OxBool OxXmlReader::run() {
-    if (!source.start(file.input->getFileLength())) {
-        std::cerr << "FATAL: Dynamic storage allocation failure." << std::endl;
-        return OxFalse;
-    }
+    source.start(file.input->getFileLength());
     OxBool result = OxTrue;
     for (;;) {
         char* line = nullptr;
@@ -33,11 +30,6 @@ OxBool OxXmlReader::run() {
             break;
         }
         if (got == OxXmlLineSource::ReadFailure) {
-            result = OxFalse;
-            break;
-        }
-        if (got == OxXmlLineSource::NoMemory) {
-            std::cerr << "FATAL: Dynamic storage allocation failure." << std::endl;
             result = OxFalse;
             break;
         }
@@ -116,13 +108,11 @@ int OxXmlReader::doStart() {
         return OxMsgXmlNoDeclaration;
     }
     cursor = open;
-    OxXmlElement* node =
-        new (std::nothrow) OxXmlElement(OxXmlElement::XML_TYPE_DECLARATION, nullptr);
-    if (node != nullptr) {
-        node->setValue(cursor);
-        delete file.declaration;
-        file.declaration = node;
-    }
+    std::unique_ptr<OxXmlElement> node(
+        new OxXmlElement(OxXmlElement::XML_TYPE_DECLARATION, nullptr));
+    node->setValue(cursor);
+    delete file.declaration;
+    file.declaration = node.release();
     char* end = std::strstr(cursor, OxXmlFile::OX_XML_DECLARATION_END);
     cursor = end != nullptr ? end + 2 : lineEnd;
     state = CONTENT;
@@ -232,13 +222,13 @@ int OxXmlReader::doAttribute() {
         state = CONTENT;
         return kGoOn;
     case '=':
-        withText(nameBegin, nameEnd,
-                 [this](char const* text) { attribute = new (std::nothrow) OxXmlAttribute(text); });
+        attribute = nullptr;
         if (current != nullptr) {
-            current->addAttribute(attribute);
-        } else {
-            delete attribute;
-            attribute = nullptr;
+            std::unique_ptr<OxXmlAttribute> made;
+            withText(nameBegin, nameEnd,
+                     [&made](char const* text) { made.reset(new OxXmlAttribute(text)); });
+            current->addAttribute(made.get());
+            attribute = made.release(); // the element has it; its value comes next
         }
         cursor++;
         state = ATTRIBUTE_VALUE;
@@ -274,9 +264,11 @@ int OxXmlReader::doAttributeValue() {
     // A quote that ends its line leaves nothing to gather, and the value then
     // fails at its closing quote.
     gathered.clear();
-    gatheredValid = cursor < lineEnd &&
-                    gathered.append(cursor, static_cast<size_t>(lineEnd - cursor)) &&
-                    gathered.append(' ');
+    gatheredValid = cursor < lineEnd;
+    if (gatheredValid) {
+        gathered.append(cursor, static_cast<size_t>(lineEnd - cursor));
+        gathered.append(' ');
+    }
     gathering = true;
     cursor = lineEnd;
     state = ATTRIBUTE_VALUE_MORE;
@@ -287,8 +279,8 @@ int OxXmlReader::doAttributeValueMore() {
     char* close = find(cursor, quote);
     if (close == nullptr) {
         if (gatheredValid) {
-            gatheredValid = gathered.append(cursor, static_cast<size_t>(lineEnd - cursor)) &&
-                            gathered.append(' ');
+            gathered.append(cursor, static_cast<size_t>(lineEnd - cursor));
+            gathered.append(' ');
         }
         cursor = lineEnd;
         return kGoOn;
@@ -297,9 +289,7 @@ int OxXmlReader::doAttributeValueMore() {
     if (!gatheredValid) {
         return kAbort;
     }
-    if (!gathered.append(cursor, static_cast<size_t>(close - cursor))) {
-        return kAbort;
-    }
+    gathered.append(cursor, static_cast<size_t>(close - cursor));
     if (attribute != nullptr) {
         attribute->setValue(gathered.text());
     }
@@ -313,10 +303,11 @@ int OxXmlReader::doComment(bool cdata) {
     int kind = cdata ? 1 : 0;
     size_t length = static_cast<size_t>(lineEnd - cursor);
     if (!commentOpen[kind]) {
+        std::unique_ptr<OxXmlElement> node(
+            new OxXmlElement(OxXmlElement::XML_TYPE_COMMENT, nullptr));
+        attach(node.get());
+        commentNode[kind] = node.release(); // its place in the document has it
         commentOpen[kind] = true;
-        commentNode[kind] =
-            new (std::nothrow) OxXmlElement(OxXmlElement::XML_TYPE_COMMENT, nullptr);
-        attach(commentNode[kind]);
         commentText[kind].clear();
         commentText[kind].expectAtMost(length + source.unconsumed());
         commentText[kind].append(cursor, length);
@@ -337,10 +328,10 @@ int OxXmlReader::doComment(bool cdata) {
 int OxXmlReader::doDoctype() {
     size_t length = static_cast<size_t>(lineEnd - cursor);
     if (file.doctype == nullptr) {
-        OxXmlElement* node =
-            new (std::nothrow) OxXmlElement(OxXmlElement::XML_TYPE_DOCTYPE, nullptr);
-        file.doctype = node;
-        attach(node);
+        std::unique_ptr<OxXmlElement> node(
+            new OxXmlElement(OxXmlElement::XML_TYPE_DOCTYPE, nullptr));
+        attach(node.get());
+        file.doctype = node.release(); // its place in the document has it
         doctypeText.clear();
         doctypeText.append(cursor, length);
         doctypeLoaded = true;
@@ -366,23 +357,22 @@ int OxXmlReader::doDoctype() {
 }
 
 void OxXmlReader::createElement(char* tagStart, char* nameBegin, char* nameEnd, bool makeCurrent) {
+    std::unique_ptr<OxXmlElement> made;
+    withText(nameBegin, nameEnd, [&made](char const* text) { made.reset(new OxXmlElement(text)); });
     OxXmlElement* element = nullptr;
-    withText(nameBegin, nameEnd,
-             [&element](char const* text) { element = new (std::nothrow) OxXmlElement(text); });
-    if (element == nullptr) {
-        return; // no memory: the node is absent
-    }
     if (file.root == nullptr) {
-        file.root = element;
+        element = file.root = made.release();
     } else if (current != nullptr) {
-        current->addChild(element);
+        current->addChild(made.get());
+        element = made.release(); // the parent has it
         element->setParent(current);
     } else {
         // A second element at top level has no parent to go to: it is kept
         // behind the root, where the writer writes it back.
         OxMsg::Log(OxMsgXmlSecondTopLevel, fileName(), lineNumber, offsetOf(tagStart),
-                   nameOrEmpty(element->getName()));
-        file.postRootNodes.append(element);
+                   nameOrEmpty(made->getName()));
+        file.postRootNodes.append(made.get());
+        element = made.release(); // the list has it
     }
     if (makeCurrent) {
         current = element;

@@ -13,7 +13,6 @@
 
 #include <cstddef>
 #include <cstring>
-#include <new>
 
 namespace oxbase {
 namespace detail {
@@ -33,17 +32,14 @@ public:
             data[0] = '\0';
         }
     }
-    /// False when memory ran out; the text is then unchanged.
-    bool append(char const* text, size_t count) {
-        if (!reserve(length + count + 1)) {
-            return false;
-        }
+    /// Without memory std::bad_alloc, and the text is unchanged.
+    void append(char const* text, size_t count) {
+        reserve(length + count + 1);
         std::memcpy(data + length, text, count);
         length += count;
         data[length] = '\0';
-        return true;
     }
-    bool append(char c) { return append(&c, 1); }
+    void append(char c) { append(&c, 1); }
     /// The text, NUL-terminated; "" while nothing was appended.
     char const* text() const { return data != nullptr ? data : ""; }
     /// Tells the buffer that its text will not grow beyond `maxLength`
@@ -64,9 +60,9 @@ public:
     }
 
 private:
-    bool reserve(size_t needed) {
+    void reserve(size_t needed) {
         if (needed <= capacity) {
-            return true;
+            return;
         }
         size_t grown = capacity < 64 ? 64 : capacity;
         while (grown < needed) {
@@ -77,17 +73,13 @@ private:
         if (grown > kLongText && ceiling >= needed) {
             grown = ceiling;
         }
-        char* bigger = new (std::nothrow) char[grown];
-        if (bigger == nullptr) {
-            return false;
-        }
+        char* bigger = new char[grown];
         if (length > 0) {
             std::memcpy(bigger, data, length);
         }
         delete[] data;
         data = bigger;
         capacity = grown;
-        return true;
     }
 
     static constexpr size_t kLongText = 1u << 20;

@@ -6,7 +6,7 @@
 // writing stops at the first failed write and counts the bytes before it.
 //
 //   oxbase::detail::setIdentity<4>(m);
-//   long long bytes = oxbase::detail::writeFields(output, fields, oxbase::detail::Scaled{2.0f});
+//   long long bytes = writeFields(output, fields, Scaled{2.0f});
 //   float f = oxbase::detail::narrow(1e300);   // +infinity, by the IEEE rule
 #ifndef OXBASE_GEOM_DETAIL_OXGEOMDETAIL_H
 #define OXBASE_GEOM_DETAIL_OXGEOMDETAIL_H

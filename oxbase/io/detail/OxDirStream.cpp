@@ -1,6 +1,8 @@
 // OxDirStream.cpp: directory streams over the platform's find handles.
 #include "oxbase/io/detail/OxDirStream.h"
 
+#include "oxbase/core/detail/OxKeepErrno.h"
+#include "oxbase/core/detail/OxNoMemory.h"
 #include "oxbase/diag/OxPrt.h"
 #include "oxbase/platform/detail/OxPlatformDir.h"
 
@@ -30,11 +32,13 @@ OxDirStream* OxDirStream::opendir(const char* name) {
     }
     size_t length = std::strlen(name);
     bool endsInSeparator = name[length - 1] == '/' || name[length - 1] == '\\';
-    char* pattern = new (std::nothrow) char[length + 3];
-    OxDirStream* stream = new (std::nothrow) OxDirStream;
-    if (pattern == nullptr || stream == nullptr) {
+    char* pattern = nullptr;
+    OxDirStream* stream = nullptr;
+    if (!withMemory([&] {
+            pattern = new char[length + 3];
+            stream = new OxDirStream;
+        })) {
         delete[] pattern;
-        delete stream;
         errno = ENOMEM;
         return nullptr;
     }
@@ -44,16 +48,20 @@ OxDirStream* OxDirStream::opendir(const char* name) {
     stream->pattern = pattern;
 
     const char* first = nullptr;
-    stream->handle = OxPlatformFindFirst(pattern, &first);
+    if (!withMemory([&] { stream->handle = OxPlatformFindFirst(pattern, &first); })) {
+        delete[] stream->pattern;
+        delete stream;
+        errno = ENOMEM;
+        return nullptr;
+    }
     if (stream->handle == nullptr) {
-        int saved = errno;
+        OxKeepErrno keep; // the listing's own errno goes to the caller
         if (OxPrt::getTraceThreshold() >= 99) {
             std::cerr << "opendir: _findfirst failed to locate \"" << pattern << "\"\n"
                       << std::flush;
         }
         delete[] stream->pattern;
         delete stream;
-        errno = saved;
         return nullptr;
     }
     stream->pending = first; // the platform keeps it until the next call on the handle

@@ -1,5 +1,6 @@
 #include "oxbase/platform/detail/OxPlatformDir.h"
 
+#include "oxbase/core/detail/OxKeepErrno.h"
 #include "oxbase/platform/detail/OxPlatformPath.h"
 
 #include <cctype>
@@ -34,16 +35,11 @@ OxPlatformFindHandle* OxPlatformFindFirst(const char* pattern, const char** firs
         errno = EINVAL;
         return nullptr;
     }
-    OxPlatformFindHandle* handle = new (std::nothrow) OxPlatformFindHandle;
-    if (handle == nullptr) {
-        errno = ENOMEM;
-        return nullptr;
-    }
+    OxPlatformFindHandle* handle = new OxPlatformFindHandle;
     handle->handle = _findfirst64i32(pattern, &handle->data);
     if (handle->handle == -1) {
-        int saved = errno;
+        OxKeepErrno keep;
         delete handle;
-        errno = saved;
         return nullptr;
     }
     *first = handle->data.name;
@@ -93,16 +89,11 @@ OxPlatformFindHandle* OxPlatformFindFirst(const char* pattern, const char** firs
     if (directory.empty()) {
         directory = ".";
     }
-    OxPlatformFindHandle* handle = new (std::nothrow) OxPlatformFindHandle;
-    if (handle == nullptr) {
-        errno = ENOMEM;
-        return nullptr;
-    }
+    OxPlatformFindHandle* handle = new OxPlatformFindHandle;
     handle->dir = ::opendir(directory.c_str());
     if (handle->dir == nullptr) {
-        int saved = errno;
+        OxKeepErrno keep;
         delete handle;
-        errno = saved;
         return nullptr;
     }
     // readdir answers null both at the end and on failure; errno tells them

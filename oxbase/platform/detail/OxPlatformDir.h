@@ -7,8 +7,11 @@
 //
 //   const char * name = nullptr;
 //   OxPlatformFindHandle * handle = OxPlatformFindFirst("/data/*", &name);
-//   while (handle != nullptr && name != nullptr) { ...; if (OxPlatformFindNext(handle, &name) != 0)
-//   break; } OxPlatformFindClose(handle);
+//   while (handle != nullptr && name != nullptr) {
+//       use(name);
+//       if (OxPlatformFindNext(handle, &name) != 0) break;
+//   }
+//   OxPlatformFindClose(handle);
 #ifndef OXBASE_PLATFORM_DETAIL_OXPLATFORMDIR_H
 #define OXBASE_PLATFORM_DETAIL_OXPLATFORMDIR_H
 
@@ -27,7 +30,8 @@ struct OxPlatformFindHandle;
 /// handle is returned and `*first` is the first entry's name, or null when the
 /// directory has no entry at all. On failure null with errno set (13 for a
 /// refused directory, 2 for a missing one). The name stays valid until the
-/// next call on the handle.
+/// next call on the handle. Without memory for the handle std::bad_alloc
+/// reaches the caller.
 OxPlatformFindHandle* OxPlatformFindFirst(const char* pattern, const char** first);
 /// The next entry's name in `*name`: 0, or -1 at the end of the listing (or
 /// with errno set on failure).
