@@ -6,6 +6,7 @@
 #include "oxbase/platform/detail/OxPlatformFs.h"
 #include "oxbase/platform/detail/OxPlatformPath.h"
 
+#include <climits>
 #include <cstdio>
 #include <cstring>
 #include <iomanip>
@@ -374,13 +375,18 @@ OxMsgRecord_s* OxMsg::format(unsigned int number, va_list arguments) {
             break; // the text cannot be formatted: log what is there
         }
         retriedError = retriedError || written < 0;
-        int grown = buflen > 0 ? buflen : kInitialBufferSize;
-        while (grown <= written && grown < (1 << 30)) {
-            grown *= 2;
+        // The size is an int: a buffer that cannot double within that range
+        // keeps the text cut to it, as vsnprintf left it, terminated.
+        if (buflen > INT_MAX / 2) {
+            if (written < 0) {
+                buf[0] = '\0';
+            }
+            break;
         }
-        if (grown == buflen) {
+        int grown = buflen;
+        do {
             grown *= 2;
-        }
+        } while (grown <= written && grown <= INT_MAX / 2);
         delete[] buf;
         buf = nullptr;
         buflen = withMemory([grown] { buf = new char[static_cast<size_t>(grown)]; }) ? grown : 0;

@@ -59,7 +59,9 @@ public:
     ~OxMsg();
 
     /// Logs message `number` with printf arguments, unless its level is below
-    /// the threshold.
+    /// the threshold. The format buffer doubles from 51,200 bytes as a text
+    /// needs; one longer than the last size within an int (51,200 * 2^15)
+    /// is cut to it.
     static void Log(unsigned int number, ...);
     /// The same operation as Log by number.
     static void LogError(unsigned int number, ...);

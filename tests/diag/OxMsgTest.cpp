@@ -3,6 +3,7 @@
 
 #include <gtest/gtest.h>
 
+#include <cstring>
 #include <filesystem>
 #include <memory>
 #include <string>
@@ -140,6 +141,17 @@ TEST_F(OxMsgTest, FileFormatContinuationsWideNumbersAndLongTexts) {
     EXPECT_EQ(callbackTexts.back(), "Long " + big);
     std::string huge(300000, 'h'); // several doublings
     EXPECT_EQ(std::string(OxMsg::LogToString(40u, huge.c_str())), "Long " + huge);
+}
+
+TEST_F(OxMsgTest, TextBeyondTheLargestBufferIsCut) {
+    // The buffer doubles from 51,200 bytes while its size stays an int:
+    // 51,200 * 2^15 is the last size, and a text that needs more is cut to it
+    // (less its terminator) instead of the size running out of range.
+    auto msg = start("8,I,0%1900000000s\n", nullptr);
+    const char* text = OxMsg::LogToString(8u, "x");
+    ASSERT_NE(text, nullptr);
+    EXPECT_EQ(std::strlen(text), 51200u * 32768u - 1);
+    EXPECT_EQ(text[0], ' ');
 }
 
 TEST_F(OxMsgTest, BadMessageFilesKeepWhatWasRead) {
