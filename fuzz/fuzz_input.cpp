@@ -27,6 +27,8 @@
 #include "OxFuzzSupport.h"
 
 #include "oxbase/diag/OxPrt.h"
+#include "oxbase/geom/OxBBox.h"
+#include "oxbase/geom/OxBSphere.h"
 #include "oxbase/geom/OxColor.h"
 #include "oxbase/geom/OxRot.h"
 #include "oxbase/geom/OxVec.h"
@@ -51,10 +53,19 @@ template <class T> long long readGeometry(OxInput& input) {
     return value.readValue(input);
 }
 
+/// The float forms read with a scale factor.
+template <class T> long long readScaled(OxInput& input) {
+    T value;
+    return value.readValue(input, 2.0f);
+}
+
 const GeometryReader kGeometryReaders[] = {
-    {"OxVec2d", readGeometry<OxVec2d>}, {"OxVec3d", readGeometry<OxVec3d>},
-    {"OxVec4d", readGeometry<OxVec4d>}, {"OxColor", readGeometry<OxColor>},
-    {"OxRot", readGeometry<OxRot>},     {"OxRot2d", readGeometry<OxRot2d>},
+    {"OxVec2d", readGeometry<OxVec2d>},     {"OxVec3d", readGeometry<OxVec3d>},
+    {"OxVec4d", readGeometry<OxVec4d>},     {"OxColor", readGeometry<OxColor>},
+    {"OxRot", readGeometry<OxRot>},         {"OxRot2d", readGeometry<OxRot2d>},
+    {"OxBBox", readGeometry<OxBBox>},       {"OxBBoxf", readScaled<OxBBoxf>},
+    {"OxBRect", readGeometry<OxBRect>},     {"OxBSphere", readGeometry<OxBSphere>},
+    {"OxBSpheref", readScaled<OxBSpheref>},
 };
 constexpr unsigned int kGeometryCount = sizeof kGeometryReaders / sizeof kGeometryReaders[0];
 

@@ -111,6 +111,14 @@ public:
 /// whether the failure was reached. Ends after the first run that was not
 /// reached (the operation ran through). No run may keep a block.
 void untilItRunsThrough(const std::function<bool(long long n)>& once) {
+    {
+        Armed probe(1000000);
+        delete new int(0);
+        if (counted == 0) {
+            GTEST_SKIP() << "operator new is not this program's (valgrind replaces it): nothing "
+                            "can be made to fail";
+        }
+    }
     once(1000000); // unarmed in effect: lazy statics are made before counting
     for (long long n = 1; n < 100000; n++) {
         long long before = liveBlocks;
