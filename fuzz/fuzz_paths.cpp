@@ -167,7 +167,7 @@ void checkCleanup(const std::string& path) {
 }
 
 void checkPair(const char* first, const char* second) {
-    Text spec(OxFile::makeFileSpec(first, second));
+    Text fileSpec(OxFile::makeFileSpec(first, second));
     std::string expected;
     if (first == nullptr || second == nullptr) {
         expected = first != nullptr ? first : (second != nullptr ? second : "");
@@ -178,8 +178,9 @@ void checkPair(const char* first, const char* second) {
         }
         expected += second;
     }
-    OXFUZZ_CHECK(expected.empty() ? spec == nullptr : spec != nullptr && expected == spec.get(),
-                 "makeFileSpec gave %s, expected \"%s\"", textOf(spec).c_str(),
+    OXFUZZ_CHECK(expected.empty() ? fileSpec == nullptr
+                                  : fileSpec != nullptr && expected == fileSpec.get(),
+                 "makeFileSpec gave %s, expected \"%s\"", textOf(fileSpec).c_str(),
                  oxfuzz::shown(expected).c_str());
     if (first == nullptr || second == nullptr) {
         return;
