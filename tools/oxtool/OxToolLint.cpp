@@ -138,7 +138,6 @@ private:
             cursor++;
         }
     }
-    bool rawTrimmed() const { return *raw != *text; }
 
     void step() {
         switch (state) {
@@ -323,9 +322,15 @@ private:
             open[index] = static_cast<int>(shadow.nodes.size()) - 1;
         }
         ShadowNode& node = shadow.nodes[static_cast<size_t>(open[index])];
+        bool firstLine = node.line == number;
         node.lastLine = number;
-        node.linesTrimmed = node.linesTrimmed || rawTrimmed();
         size_t end = text->find(marker, cursor);
+        // White space inside the construct that the trimming of lines takes:
+        // in front of a following line, and behind a line it goes on from.
+        bool lead = !raw->empty() && std::isspace(static_cast<unsigned char>(raw->front()));
+        bool trail = !raw->empty() && std::isspace(static_cast<unsigned char>(raw->back()));
+        node.linesTrimmed =
+            node.linesTrimmed || (!firstLine && lead) || (end == std::string::npos && trail);
         if (end != std::string::npos) {
             node.after = trim(text->substr(end + std::strlen(marker)));
             open[index] = -1;
