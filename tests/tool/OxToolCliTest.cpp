@@ -19,8 +19,8 @@ const char* const kClean = "<?xml version=\"1.0\"?>\n<a>\n <b x=\"1\"/>\n <c>tex
 const char* const kMismatch = "<?xml version=\"1.0\"?>\n<a>\n<b></c>\n</a>\n";
 const char* const kBroken = "<?xml version=\"1.0\"?>\n<a>\n<b x=1/>\n</a>\n";
 
-const char* const kCommands[] = {"check", "csv",    "demo", "hexdump", "list",    "log",
-                                 "paths", "ranges", "walk", "xml",     "xml-dump"};
+const char* const kCommands[] = {"check",    "csv",   "demo",   "hexdump", "list", "log",
+                                 "messages", "paths", "ranges", "walk",    "xml",  "xml-dump"};
 
 } // namespace
 
@@ -302,4 +302,23 @@ TEST(OxToolDemo, RunsEveryStepOverTheSampleData) {
     EXPECT_TRUE(contains(demo.out, "all succeeded"));
     EXPECT_TRUE(fs::exists(dir.file("out/assembly.xml")));
     EXPECT_TRUE(fs::exists(dir.file("out/demo.log")));
+}
+
+TEST(OxToolMessages, TableOfLibraryNumbersAndTheGuideCopy) {
+    // docs/messages.md is this command's output over the bundled file.
+    std::string data = OXBASE_DATA_DIR;
+    oxtest::CommandResult table =
+        oxtool("messages --markdown --messages \"" + data + "/oxbase.msg\"");
+    EXPECT_EQ(table.status, 0);
+    EXPECT_EQ(table.out, oxtest::readFile(data + "/../docs/messages.md"))
+        << "docs/messages.md is out of date: build the docs target";
+    EXPECT_TRUE(contains(table.out, "| 566 | E | text, number, number, text | "));
+    // A file that lacks numbers: each shown as such, and a warning.
+    oxtest::TempDir dir;
+    oxtest::writeFile(dir.file("own.msg"), "1,E,0cannot open %s\n");
+    oxtest::CommandResult own = oxtool("messages --messages own.msg", dir.path());
+    EXPECT_EQ(own.status, 4);
+    EXPECT_TRUE(contains(own.out, "   1 E  text"));
+    EXPECT_TRUE(contains(own.out, " 579 -  text"));
+    EXPECT_TRUE(contains(own.err, "have no text in own.msg"));
 }
