@@ -196,7 +196,6 @@ private:
             }
             int next = depth >= 24 || chance(35) ? 0 : pick(1, 3);
             if (chance(3) && depth < 3) {
-                next = 1;
                 for (int d = depth + 1; d < depth + 26; d++) {
                     text += std::string(static_cast<size_t>(d % 7), ' ') + "<deep>" + newline;
                 }

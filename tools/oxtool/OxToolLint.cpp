@@ -423,6 +423,19 @@ void add(std::vector<OxToolFinding>& findings, unsigned int line, const char* ca
     findings.push_back(std::move(finding));
 }
 
+/// Text behind the end marker of a comment, CDATA section or DOCTYPE.
+void addTextBehindEnd(std::vector<OxToolFinding>& findings, unsigned int line,
+                      const std::string& kind, const std::string& after) {
+    std::string text = "the text ";
+    text += excerpt(after);
+    text += " behind the end of the ";
+    text += kind;
+    text += " is kept in the ";
+    text += kind;
+    text += " and not read as markup";
+    add(findings, line, oxlint::kTextBehindRawEnd, text);
+}
+
 void lintRangeText(std::vector<OxToolFinding>& findings, unsigned int line,
                    const std::string& where, const char* value) {
     // A list, not a single number: a long number alone (an identifier, a
@@ -487,9 +500,7 @@ void lintTree(const OxXmlElement* root, const Shadow& shadow,
             }
             std::string kind = rawKind(*element);
             if (!source->after.empty()) {
-                add(findings, source->lastLine, oxlint::kTextBehindRawEnd,
-                    "the text " + excerpt(source->after) + " behind the end of the " + kind +
-                        " is kept in the " + kind + " and not read as markup");
+                addTextBehindEnd(findings, source->lastLine, kind, source->after);
             }
             if (!source->before.empty()) {
                 add(findings, line, oxlint::kRawSharesLine,
@@ -578,10 +589,9 @@ void lintTopLevel(const Shadow& shadow, std::vector<OxToolFinding>& findings) {
                     "is read as content and dropped");
             }
         } else if (node.kind != ShadowNode::Element && !node.inRoot && !node.after.empty()) {
-            std::string kind = node.kind == ShadowNode::Cdata ? "CDATA section" : "comment";
-            add(findings, node.lastLine, oxlint::kTextBehindRawEnd,
-                "the text " + excerpt(node.after) + " behind the end of the " + kind +
-                    " is kept in the " + kind + " and not read as markup");
+            addTextBehindEnd(findings, node.lastLine,
+                             node.kind == ShadowNode::Cdata ? "CDATA section" : "comment",
+                             node.after);
         }
     }
 }
@@ -834,8 +844,9 @@ std::vector<OxToolFinding> oxtoolWalkFindings(const std::string& walkErrors,
             }
             finding.severity = OxErrorWarning;
             finding.tag = std::string("lint:") + oxlint::kWalkUnlisted;
-            finding.text = "the directory " + path + " cannot be listed (" + reason +
-                           "): the walk treats it as empty, and nothing in it is checked";
+            finding.text = "the directory " + path;
+            finding.text += " cannot be listed (" + reason;
+            finding.text += "): the walk treats it as empty, and nothing in it is checked";
         } else if (error == std::errc::too_many_symbolic_link_levels) {
             finding.severity = OxErrorError;
             finding.tag = std::string("lint:") + oxlint::kWalkLoop;

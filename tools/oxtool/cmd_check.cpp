@@ -438,9 +438,13 @@ int runWorkers(const OxToolContext& context, const CheckOptions& options,
         if (options.verbose) {
             command += " --verbose";
         }
-        command += " > " + shellQuote(worker->outPath) + " 2> " + shellQuote(worker->errPath);
+        command += " > ";
+        command += shellQuote(worker->outPath);
+        command += " 2> ";
+        command += shellQuote(worker->errPath);
         if (fs::path::preferred_separator == '\\') {
-            command = "\"" + command + "\""; // cmd.exe drops the outer quotes
+            command.insert(0, 1, '"'); // cmd.exe drops the outer quotes
+            command += '"';
         }
         Worker* raw = worker.get();
         threads.emplace_back([raw, command]() {
