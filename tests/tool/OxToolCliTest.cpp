@@ -271,6 +271,9 @@ TEST(OxToolCsvHexdumpPathsRanges, OutputAndStatus) {
     EXPECT_EQ(checked.status, 4);
     EXPECT_TRUE(contains(checked.out, "t.csv:2: warning: ")) << checked.out;
     EXPECT_TRUE(contains(checked.out, "(b) is empty")) << checked.out;
+    // With --log, the lint warnings are in the log too.
+    EXPECT_EQ(oxtool("check t.csv --log check.log", dir.path()).status, 4);
+    EXPECT_TRUE(contains(oxtest::readFile(dir.file("check.log")), "t.csv:2: warning: "));
 
     oxtest::writeFile(dir.file("bytes"), "ABC");
     oxtest::CommandResult hex = oxtool("hexdump -", dir.path(), dir.file("bytes"));

@@ -214,14 +214,22 @@ bool collectFiles(const std::vector<std::string>& operands, const CheckOptions& 
 // ---------------------------------------------------------------------------
 // Checking one file
 
+/// One line of the report on standard output. The tool's own findings (the
+/// library's messages are there already) also go to the log file.
 void printFinding(const std::string& path, const OxToolFinding& finding) {
-    std::string head = path;
+    std::string line = path;
     if (finding.line != 0) {
-        head += ":" + std::to_string(finding.line);
+        line += ":" + std::to_string(finding.line);
     }
-    std::printf("%s: %s: %s%s%s%s\n", head.c_str(), oxtoolSeverityName(finding.severity),
-                finding.text.c_str(), finding.tag.empty() ? "" : " [", finding.tag.c_str(),
-                finding.tag.empty() ? "" : "]");
+    line += std::string(": ") + oxtoolSeverityName(finding.severity) + ": " + finding.text;
+    if (!finding.tag.empty()) {
+        line += " [" + finding.tag + "]";
+    }
+    std::printf("%s\n", line.c_str());
+    std::ofstream* log = OxMsg::getLogFile();
+    if (log != nullptr && finding.tag.compare(0, 4, "msg ") != 0) {
+        *log << line << "\n" << std::flush;
+    }
 }
 
 /// Reads `path` with the library, lints it, prints what was found and adds
