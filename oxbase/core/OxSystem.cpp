@@ -127,6 +127,10 @@ char* OxSystem::strncpy(char* target, size_t size, const char* text, size_t coun
     return target;
 }
 
+OxBool OxSystem::isTerminal(int descriptor) {
+    return OxToBool(OxPlatformIsTerminal(descriptor));
+}
+
 OxSystem::OxOperatingSystem OxSystem::getOS() {
     switch (OxPlatformOperatingSystem()) {
     case OxOSWindows:

@@ -65,6 +65,10 @@ public:
     /// A new array: the computer's name, a blank, the system's name and a
     /// trailing blank ("build01 Linux "); null when the name is not available.
     static char* getOSName();
+    /// Whether the file descriptor `descriptor` (0 standard input, 1 standard
+    /// output, 2 standard error) is a terminal: OxFalse for a file, a pipe,
+    /// a closed or an invalid descriptor.
+    static OxBool isTerminal(int descriptor);
 
 private:
     static char asctime_buffer[49];

@@ -3,6 +3,7 @@
 #include "oxbase/diag/OxMsg.h"
 
 #include <atomic>
+#include <cstdlib>
 #include <filesystem>
 #include <fstream>
 #include <iostream>
@@ -161,5 +162,27 @@ std::string inChild(const std::function<std::string()>&, ChildLimits) {
     return "no fork on this platform";
 }
 #endif
+
+CommandResult runCommand(const std::string& command, const std::string& input) {
+    TempDir outputs;
+    std::string line = command;
+#ifdef _WIN32
+    line += " < \"" + (input.empty() ? std::string("NUL") : input) + "\"";
+#else
+    line += " < \"" + (input.empty() ? std::string("/dev/null") : input) + "\"";
+#endif
+    line += " > \"" + outputs.file("out") + "\" 2> \"" + outputs.file("err") + "\"";
+    std::cout.flush();
+    int raw = std::system(line.c_str());
+    CommandResult result;
+#ifdef _WIN32
+    result.status = raw;
+#else
+    result.status = raw != -1 && WIFEXITED(raw) ? WEXITSTATUS(raw) : -1;
+#endif
+    result.out = readFile(outputs.file("out"));
+    result.err = readFile(outputs.file("err"));
+    return result;
+}
 
 } // namespace oxtest

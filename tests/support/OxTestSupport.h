@@ -82,6 +82,18 @@ struct ChildLimits {
 std::string inChild(const std::function<std::string()>& body, ChildLimits limits = {});
 bool canFork();
 
+/// What a program run by `runCommand` did.
+struct CommandResult {
+    int status = -1; ///< its exit status; -1 when it did not exit by itself
+    std::string out; ///< standard output
+    std::string err; ///< standard error
+};
+
+/// Runs `command`, a command line for the system's command processor, with
+/// standard input from the file `input` (none: an empty input) and both
+/// outputs caught.
+CommandResult runCommand(const std::string& command, const std::string& input = "");
+
 } // namespace oxtest
 
 #endif

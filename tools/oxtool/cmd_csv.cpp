@@ -7,9 +7,10 @@
 // per matching record ("record N: name=value ..."). ATTR alone finds every
 // record that has the attribute; ATTR=VALUE also needs that exact value. With
 // OUT.csv the header and records are written there (the records padded to the
-// table width). Exit status: 0 done, 1 the file could not be read or written,
-// 2 a misused command.
+// table width). "-" is standard input or output. A file that cannot be read or
+// written gives 8, a misused command 2.
 #include "OxToolCommand.h"
+#include "OxToolFiles.h"
 
 #include "oxbase/diag/OxMsg.h"
 #include "oxbase/doc/OxCsvFile.h"
@@ -23,16 +24,7 @@
 #include <sstream>
 #include <string>
 
-#ifndef OXTOOL_DEFAULT_DATA_DIR
-#define OXTOOL_DEFAULT_DATA_DIR "data"
-#endif
-
 namespace {
-
-int usage() {
-    std::fprintf(stderr, "usage: oxtool csv IN.csv [--sep C] [--find ATTR[=VALUE]] [OUT.csv]\n");
-    return 2;
-}
 
 void printColumns(const OxCsvFile& csv) {
     const OxGList<char*>& names = csv.getColumnNames();
@@ -75,46 +67,54 @@ unsigned int findAll(const OxCsvFile& csv, const std::string& query) {
     return hits;
 }
 
-int runCsv(int argc, char** argv) {
-    const char* in = nullptr;
-    const char* out = nullptr;
-    const char* query = nullptr;
-    char separator = ',';
-    for (int i = 1; i < argc; i++) {
-        if (std::strcmp(argv[i], "--sep") == 0 && i + 1 < argc) {
-            if (std::strlen(argv[i + 1]) != 1) {
-                return usage();
-            }
-            separator = argv[++i][0];
-        } else if (std::strcmp(argv[i], "--find") == 0 && i + 1 < argc) {
-            query = argv[++i];
-        } else if (argv[i][0] == '-' && argv[i][1] == '-') {
-            return usage();
-        } else if (in == nullptr) {
-            in = argv[i];
-        } else if (out == nullptr) {
-            out = argv[i];
-        } else {
-            return usage();
+int runCsv(const OxToolContext& context) {
+    std::string separatorText = context.value("sep", ",");
+    if (separatorText.size() != 1) {
+        std::fprintf(stderr, "oxtool csv: --sep takes one character, not '%s'\n",
+                     separatorText.c_str());
+        return kOxToolUsage;
+    }
+    char separator = separatorText[0];
+    std::string query = context.value("find");
+    if (context.has("find") && (query.empty() || query[0] == '=')) {
+        std::fprintf(stderr, "oxtool csv: --find needs ATTR or ATTR=VALUE\n");
+        return kOxToolUsage;
+    }
+    const std::string& inOperand = context.operands[0];
+    std::string out = context.operands.size() > 1 ? context.operands[1] : "";
+    OxToolTempDir scratch;
+    std::string in = inOperand;
+    if (inOperand == "-") {
+        in = scratch.file("stdin.csv");
+        if (scratch.path().empty() || !oxtoolCopyStdinTo(in)) {
+            oxtoolReport(OxErrorError, "cannot keep standard input in a scratch file");
+            return kOxToolFailed;
         }
     }
-    if (in == nullptr || (query != nullptr && (*query == '\0' || *query == '='))) {
-        return usage();
-    }
-    OxMsg msg("oxbase.msg", OXTOOL_DEFAULT_DATA_DIR, nullptr, nullptr);
-    OxCsvFile csv(in, OxFile::OxIOInput, separator);
+    OxCsvFile csv(in.c_str(), OxFile::OxIOInput, separator);
     if (csv.readFile() != OxTrue) {
-        std::fprintf(stderr, "oxtool csv: cannot read %s\n", in);
-        return 1;
+        oxtoolReport(OxErrorError, "cannot read " + inOperand);
+        return kOxToolFailed;
+    }
+    // With the table on standard output, the report goes to standard error.
+    std::streambuf* saved = nullptr;
+    if (out == "-") {
+        saved = std::cout.rdbuf(std::cerr.rdbuf());
     }
     printColumns(csv);
-    if (query != nullptr) {
+    if (context.has("find")) {
         findAll(csv, query);
     }
-    if (out != nullptr) {
-        if (csv.open(out, OxFile::OxIOOutput) != 0 || csv.writeFile() != OxTrue) {
-            std::fprintf(stderr, "oxtool csv: cannot write %s\n", out);
-            return 1;
+    std::cout << std::flush;
+    if (saved != nullptr) {
+        std::cout.rdbuf(saved);
+    }
+    if (!out.empty()) {
+        std::string target = out == "-" ? scratch.file("stdout.csv") : out;
+        if (csv.open(target.c_str(), OxFile::OxIOOutput) != 0 || csv.writeFile() != OxTrue ||
+            (out == "-" && !oxtoolCopyToStdout(target))) {
+            oxtoolReport(OxErrorError, "cannot write " + out);
+            return kOxToolFailed;
         }
     }
     return 0;
@@ -124,8 +124,8 @@ int runCsv(int argc, char** argv) {
 // parts and those with a supplier at all, quotes the descriptions, writes the
 // table into the demo directory and shows the written text.
 int demoCsv(const OxToolDemoContext& context) {
-    std::string logPath = oxtoolJoin(context.outDir, "csv-demo.log");
-    OxMsg msg("oxbase.msg", context.dataDir.c_str(), logPath.c_str(), nullptr);
+    std::string logPath = oxtoolLibraryPath(oxtoolJoin(context.outDir, "csv-demo.log"));
+    OxMsg msg(oxtoolLibraryPath(context.messageFile).c_str(), nullptr, logPath.c_str(), nullptr);
     std::string in = oxtoolJoin(context.dataDir, "parts.csv");
     std::string out = oxtoolJoin(context.outDir, "parts-out.csv");
     OxCsvFile csv(in.c_str(), OxFile::OxIOInput);
@@ -156,7 +156,22 @@ int demoCsv(const OxToolDemoContext& context) {
     return 0;
 }
 
-OxToolRegistration registration{{"csv", "IN.csv [--sep C] [--find ATTR[=VALUE]] [OUT.csv]",
-                                 "read a CSV table, find records, write it back", runCsv, demoCsv,
-                                 60}};
+OxToolRegistration registration{
+    {"csv",
+     "IN.csv [OUT.csv]",
+     "read a CSV table, find records, write it back",
+     "Reads IN.csv and prints its column names and record count. With --find, prints\n"
+     "each record that has the attribute ATTR (and, with =VALUE, exactly that value).\n"
+     "With OUT.csv the table is written there as the library writes it: the header,\n"
+     "then each record's values in order, padded with separators to the table width\n"
+     "(a record with an empty field has its later fields moved left: 'oxtool check'\n"
+     "warns of it). IN \"-\" is standard input, OUT \"-\" standard output (the report\n"
+     "then goes to standard error).\n",
+     {{"sep", "C", "the field separator, one character (default ',')"},
+      {"find", "ATTR[=VALUE]", "print the records that have ATTR (equal to VALUE)"}},
+     1,
+     2,
+     runCsv,
+     demoCsv,
+     60}};
 } // namespace

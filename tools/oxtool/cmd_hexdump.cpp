@@ -1,6 +1,6 @@
 // oxtool hexdump: the printHex table of a whole file on standard output.
 //
-//   oxtool hexdump FILE
+//   oxtool hexdump FILE        ("-": standard input)
 //
 // Rows of 16 bytes: the position in hexadecimal, the bytes, and the text
 // column, where bytes outside 0x20..0x7F show as ".". A last row that is not
@@ -8,6 +8,7 @@
 // The file is read in blocks; each block is a whole number of rows, so the
 // output is the same as one printHex over the whole file.
 #include "OxToolCommand.h"
+#include "OxToolFiles.h"
 
 #include "oxbase/diag/OxPrt.h"
 
@@ -50,19 +51,23 @@ bool hexdump(std::istream& in, size_t limit) {
     return !in.bad();
 }
 
-int runHexdump(int argc, char** argv) {
-    if (argc != 2) {
-        std::fprintf(stderr, "usage: oxtool hexdump FILE\n");
-        return 2;
+int runHexdump(const OxToolContext& context) {
+    const std::string& path = context.operands[0];
+    if (path == "-") {
+        if (!hexdump(std::cin, static_cast<size_t>(-1))) {
+            oxtoolReport(OxErrorError, "read error on standard input");
+            return kOxToolFailed;
+        }
+        return 0;
     }
-    std::ifstream in(argv[1], std::ios::in | std::ios::binary);
-    if (!in) {
-        std::fprintf(stderr, "oxtool hexdump: cannot open %s\n", argv[1]);
-        return 1;
+    std::ifstream in(path, std::ios::in | std::ios::binary);
+    if (!in || !oxtoolIsFile(path)) {
+        oxtoolReport(OxErrorError, "cannot open " + path);
+        return kOxToolFailed;
     }
     if (!hexdump(in, static_cast<size_t>(-1))) {
-        std::fprintf(stderr, "oxtool hexdump: read error in %s\n", argv[1]);
-        return 1;
+        oxtoolReport(OxErrorError, "read error in " + path);
+        return kOxToolFailed;
     }
     return 0;
 }
@@ -79,7 +84,17 @@ int demoHexdump(const OxToolDemoContext& context) {
     return hexdump(in, 64) ? 0 : 1;
 }
 
-OxToolRegistration registration{{"hexdump", "FILE",
-                                 "print the bytes of a file as a hexadecimal table", runHexdump,
-                                 demoHexdump, 20}};
+OxToolRegistration registration{
+    {"hexdump",
+     "FILE",
+     "print the bytes of a file as a hexadecimal table",
+     "Prints FILE (\"-\": standard input) in rows of 16 bytes: the position in\n"
+     "hexadecimal, the bytes, and the text column, where bytes outside 0x20..0x7F show\n"
+     "as \".\".\n",
+     {},
+     1,
+     1,
+     runHexdump,
+     demoHexdump,
+     20}};
 } // namespace

@@ -7,6 +7,7 @@
 // adds a demo step that writes typed values with OxOutput and reads them back
 // with OxInput and OxMemory.
 #include "OxToolCommand.h"
+#include "OxToolFiles.h"
 
 #include "oxbase/diag/OxMsg.h"
 #include "oxbase/io/OxFile.h"
@@ -52,21 +53,17 @@ void showPath(const char* path) {
     showBool("isRegularFile", OxFile::isRegularFile(path));
 }
 
-int runPaths(int argc, char** argv) {
-    if (argc < 2) {
-        std::fprintf(stderr, "usage: oxtool paths PATH...\n");
-        return 2;
-    }
-    for (int i = 1; i < argc; i++) {
-        showPath(argv[i]);
+int runPaths(const OxToolContext& context) {
+    for (const std::string& path : context.operands) {
+        showPath(path.c_str());
     }
     return 0;
 }
 
 // Demo: a few paths, then typed values written big-endian and read back.
 int demoPaths(const OxToolDemoContext& context) {
-    std::string logPath = oxtoolJoin(context.outDir, "paths-demo.log");
-    OxMsg msg("oxbase.msg", context.dataDir.c_str(), logPath.c_str(), nullptr);
+    std::string logPath = oxtoolLibraryPath(oxtoolJoin(context.outDir, "paths-demo.log"));
+    OxMsg msg(oxtoolLibraryPath(context.messageFile).c_str(), nullptr, logPath.c_str(), nullptr);
     for (const char* path : {"c:\\parts\\wheel.xml", "assembly\\hub.bin", "\\\\srv\\share\\f"}) {
         showPath(path);
     }
@@ -112,8 +109,20 @@ int demoPaths(const OxToolDemoContext& context) {
     return 0;
 }
 
-OxToolRegistration registration{{"paths", "PATH...",
-                                 "show what each path operation makes of the paths", runPaths,
-                                 demoPaths, 30}};
+OxToolRegistration registration{
+    {"paths",
+     "PATH...",
+     "show what each path operation makes of the paths",
+     "Shows what each path operation of OxFile makes of each PATH. The operations\n"
+     "follow the Windows text rules on every platform: '\\' separates, \"c:\" is a drive,\n"
+     "and a POSIX path such as /usr/share/a.xml has no separator they know of (its\n"
+     "base name is the whole text). PATH is a text here, \"-\" included; exists,\n"
+     "isDirectory and isRegularFile ask the file system.\n",
+     {},
+     1,
+     -1,
+     runPaths,
+     demoPaths,
+     30}};
 
 } // namespace

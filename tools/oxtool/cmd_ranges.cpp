@@ -5,9 +5,12 @@
 // The options apply in the order given. The output is the compacted range
 // text (an empty line for an empty set) and the number of members. A text
 // that is not accepted is reported by message number on standard error and
-// gives exit status 1; a misused command gives 2. The command also adds a
+// gives exit status 8; a misused command gives 2. A number above 32 bits,
+// which the library wraps, draws a warning (status 4). The command also adds a
 // demo step that walks, merges, negates and dumps a small example.
 #include "OxToolCommand.h"
+#include "OxToolFiles.h"
+#include "OxToolLint.h"
 
 #include "oxbase/diag/OxMsg.h"
 #include "oxbase/ranges/OxRangeList.h"
@@ -18,27 +21,7 @@
 #include <iostream>
 #include <string>
 
-#ifndef OXTOOL_DEFAULT_DATA_DIR
-#define OXTOOL_DEFAULT_DATA_DIR "data"
-#endif
-
 namespace {
-
-/// A decimal number of at most 32 bits, digits only.
-bool parseNumber(const char* text, unsigned int& value) {
-    if (text == nullptr || *text == '\0' || std::strspn(text, "0123456789") != std::strlen(text)) {
-        return false;
-    }
-    unsigned long long result = 0;
-    for (const char* p = text; *p != '\0'; p++) {
-        result = result * 10 + static_cast<unsigned long long>(*p - '0');
-        if (result > 0xFFFFFFFFull) {
-            return false;
-        }
-    }
-    value = static_cast<unsigned int>(result);
-    return true;
-}
 
 /// Members of a compact list, counted in 64 bits (0-4294967295 has 2^32).
 unsigned long long countMembers(const OxRangeList& list) {
@@ -57,40 +40,64 @@ void printSet(OxRangeList& list) {
     delete[] text;
 }
 
-int usage() {
-    std::fprintf(stderr, "usage: oxtool ranges TEXT [--negate FROM TO] [--merge TEXT]\n");
-    return 2;
+/// Parses `text` as range text, after warning of numbers that wrap.
+bool buildList(const std::string& text, OxRangeList& list) {
+    for (const OxToolRangeWrap& wrap : oxtoolRangeWraps(text)) {
+        oxtoolReport(OxErrorWarning, "in \"" + text + "\" the number " + wrap.digits +
+                                         " at position " + std::to_string(wrap.position) +
+                                         " is above 4294967295 and wraps to " +
+                                         std::to_string(wrap.wrapped));
+    }
+    OxRangeList parsed(text.c_str(), "range");
+    if (parsed.isValid() != OxTrue) {
+        return false; // the library logged why (293, 294)
+    }
+    list.merge(parsed);
+    return true;
 }
 
-int runRanges(int argc, char** argv) {
-    if (argc < 2) {
-        return usage();
+int runRanges(const OxToolContext& context) {
+    // The numbers of every --negate first: a bad one is a usage error, and
+    // nothing is done.
+    for (const auto& option : context.options) {
+        if (option.first == "negate") {
+            std::string from = option.second.substr(0, option.second.find(' '));
+            std::string to = option.second.substr(option.second.find(' ') + 1);
+            long long ignored = 0;
+            if (!oxtoolParseNumber(from, 0, 0xFFFFFFFFll, ignored) ||
+                !oxtoolParseNumber(to, 0, 0xFFFFFFFFll, ignored)) {
+                std::fprintf(stderr,
+                             "oxtool ranges: --negate needs two numbers from 0 to 4294967295, "
+                             "not '%s'\n",
+                             option.second.c_str());
+                return kOxToolUsage;
+            }
+        }
     }
-    OxMsg msg("oxbase.msg", OXTOOL_DEFAULT_DATA_DIR, nullptr, nullptr);
-    OxRangeList list(argv[1], "range");
-    if (list.isValid() != OxTrue) {
-        return 1;
+    OxRangeList list;
+    if (!buildList(context.operands[0], list)) {
+        return kOxToolFailed;
     }
-    for (int i = 2; i < argc; i++) {
-        if (std::strcmp(argv[i], "--merge") == 0 && i + 1 < argc) {
-            OxRangeList other(argv[++i], "range");
-            if (other.isValid() != OxTrue) {
-                return 1;
+    for (const auto& option : context.options) {
+        if (option.first == "merge") {
+            if (!buildList(option.second, list)) {
+                return kOxToolFailed;
             }
-            list.merge(other);
-        } else if (std::strcmp(argv[i], "--negate") == 0 && i + 2 < argc) {
-            unsigned int from = 0;
-            unsigned int to = 0;
-            if (!parseNumber(argv[i + 1], from) || !parseNumber(argv[i + 2], to)) {
-                return usage();
+        } else if (option.first == "negate") {
+            long long from = 0;
+            long long to = 0;
+            oxtoolParseNumber(option.second.substr(0, option.second.find(' ')), 0, 0xFFFFFFFFll,
+                              from);
+            oxtoolParseNumber(option.second.substr(option.second.find(' ') + 1), 0, 0xFFFFFFFFll,
+                              to);
+            if (list.getLength() == 0 || list.negate(static_cast<unsigned int>(from),
+                                                     static_cast<unsigned int>(to)) != OxTrue) {
+                oxtoolReport(
+                    OxErrorError,
+                    "cannot negate within " + std::to_string(from) + "-" + std::to_string(to) +
+                        (list.getLength() == 0 ? ": the set is empty" : ": FROM is above TO"));
+                return kOxToolFailed;
             }
-            i += 2;
-            if (list.negate(from, to) != OxTrue) {
-                std::fprintf(stderr, "oxtool ranges: cannot negate within %u-%u\n", from, to);
-                return 1;
-            }
-        } else {
-            return usage();
         }
     }
     printSet(list);
@@ -100,8 +107,8 @@ int runRanges(int argc, char** argv) {
 // Demo: an unordered text with overlaps, compacted, walked, merged with a
 // second set, negated within a span, and dumped.
 int demoRanges(const OxToolDemoContext& context) {
-    std::string logPath = oxtoolJoin(context.outDir, "ranges-demo.log");
-    OxMsg msg("oxbase.msg", context.dataDir.c_str(), logPath.c_str(), nullptr);
+    std::string logPath = oxtoolLibraryPath(oxtoolJoin(context.outDir, "ranges-demo.log"));
+    OxMsg msg(oxtoolLibraryPath(context.messageFile).c_str(), nullptr, logPath.c_str(), nullptr);
     OxRangeList list("20-22 9,1-3,2-4", "page");
     if (list.isValid() != OxTrue) {
         return 1;
@@ -134,7 +141,20 @@ int demoRanges(const OxToolDemoContext& context) {
     return 0;
 }
 
-OxToolRegistration registration{{"ranges", "TEXT [--negate FROM TO] [--merge TEXT]",
-                                 "print the compacted range set and its member count", runRanges,
-                                 demoRanges, 80}};
+OxToolRegistration registration{
+    {"ranges",
+     "TEXT",
+     "print the compacted range set and its member count",
+     "Parses TEXT as range text (numbers and pairs joined by '-', separated by ',' or\n"
+     "one blank), applies --merge and --negate in the order given, and prints the\n"
+     "compacted set and the number of its members. Text that is not range text is\n"
+     "logged by message (293, 294) and ends with status 8. Numbers are 32-bit: one\n"
+     "above 4294967295 wraps around in the library, and oxtool warns of it.\n",
+     {{"merge", "TEXT", "add the members of another range text"},
+      {"negate", "FROM TO", "replace the set by the numbers of FROM..TO it lacks"}},
+     1,
+     1,
+     runRanges,
+     demoRanges,
+     80}};
 } // namespace

@@ -7,10 +7,13 @@
 // type (D directory, F file, N no status, U unreadable directory) and the
 // path, then a count line; --ext shows only paths that end in the given
 // text. `list` reads the list files into an XML file list (directories
-// expand to their .xml files) and prints the names. A failed walk or an
-// unreadable list file gives exit status 1, a misused command 2. The demo
-// step walks the data directory and lists data/sample.lst.
+// expand to their .xml files) and prints the names. A missing start, a failed
+// walk, a walk that ended early or an unreadable list file gives exit status
+// 8, a misused command 2. The demo step walks the data directory and lists
+// data/sample.lst.
 #include "OxToolCommand.h"
+#include "OxToolLint.h"
+#include "OxToolMessages.h"
 
 #include "oxbase/doc/OxXmlFileList.h"
 #include "oxbase/io/OxFileTreeWalk.h"
@@ -32,6 +35,7 @@ struct WalkReport {
     unsigned long others = 0;
     unsigned long shown = 0;
     std::vector<std::string>* collected = nullptr; ///< paths kept instead of printed
+    std::vector<std::string> unreadable;           ///< directories reported with U
 };
 
 char typeLetter(OxFileTreeWalkType type) {
@@ -63,6 +67,9 @@ int report(const char* path, const OxStat*, OxFileTreeWalkType type, void* userD
     } else {
         walkReport->others++;
     }
+    if (type == OxFTWUnreadableDir) {
+        walkReport->unreadable.push_back(path);
+    }
     if (walkReport->extension != nullptr && !endsWith(path, walkReport->extension)) {
         return 0;
     }
@@ -76,52 +83,68 @@ int report(const char* path, const OxStat*, OxFileTreeWalkType type, void* userD
     return 0;
 }
 
-bool parseCount(const char* text, int& value) {
-    if (text == nullptr || *text == '\0' || std::strspn(text, "-0123456789") != std::strlen(text)) {
-        return false;
+bool parseCount(const OxToolContext& context, const char* name, long long minimum, int& value) {
+    if (!context.has(name)) {
+        return true;
     }
-    long long number = std::atoll(text);
-    if (number < -1 || number > 1000000) {
+    long long number = 0;
+    if (!oxtoolParseNumber(context.value(name), minimum, 1000000, number)) {
+        std::fprintf(stderr, "oxtool walk: --%s needs a number from %lld to 1000000, not '%s'\n",
+                     name, minimum, context.value(name).c_str());
         return false;
     }
     value = static_cast<int>(number);
     return true;
 }
 
-int walkUsage() {
-    std::fprintf(stderr, "usage: oxtool walk DIR [--ext .xml] [--depth N] [--streams N]\n");
-    return 2;
+/// Reports what the library's walk wrote to standard error (shown as it
+/// stands) as findings; true when the walk ended early.
+bool reportWalk(const std::string& walkErrors, const std::vector<std::string>& unreadable) {
+    std::fputs(walkErrors.c_str(), stderr);
+    std::vector<OxToolFinding> findings = oxtoolWalkFindings(walkErrors, unreadable);
+    for (const OxToolFinding& finding : findings) {
+        oxtoolReport(finding.severity, finding.text + " [" + finding.tag + "]");
+    }
+    return oxtoolWalkEndedEarly(findings);
 }
 
-int runWalk(int argc, char** argv) {
-    if (argc < 2) {
-        return walkUsage();
-    }
+int runWalk(const OxToolContext& context) {
+    const std::string& start = context.operands[0];
     WalkReport walkReport;
     int depth = -1;
     int streams = 10;
-    for (int i = 2; i < argc; i++) {
-        if (std::strcmp(argv[i], "--ext") == 0 && i + 1 < argc) {
-            walkReport.extension = argv[++i];
-        } else if (std::strcmp(argv[i], "--depth") == 0 && i + 1 < argc) {
-            if (!parseCount(argv[++i], depth)) {
-                return walkUsage();
-            }
-        } else if (std::strcmp(argv[i], "--streams") == 0 && i + 1 < argc) {
-            if (!parseCount(argv[++i], streams) || streams < 1) {
-                return walkUsage();
-            }
-        } else {
-            return walkUsage();
-        }
+    if (!parseCount(context, "depth", -1, depth) || !parseCount(context, "streams", 1, streams)) {
+        return kOxToolUsage;
+    }
+    std::string extension = context.value("ext");
+    walkReport.extension = context.has("ext") ? extension.c_str() : nullptr;
+    if (start == "-") {
+        std::fprintf(stderr, "oxtool walk: walks a directory; '-' is not accepted\n");
+        return kOxToolUsage;
+    }
+    std::error_code error;
+    if (!std::filesystem::exists(start, error)) {
+        oxtoolReport(OxErrorError, "no such file or directory: " + start);
+        return kOxToolFailed;
     }
     std::fflush(stdout);
-    OxFileTreeWalk walk(argv[1], report, streams, depth, &walkReport);
-    int result = walk.run();
+    int result = 0;
+    std::string walkErrors;
+    {
+        OxToolMessageCapture capture(nullptr, true, false);
+        OxFileTreeWalk walk(start.c_str(), report, streams, depth, &walkReport);
+        result = walk.run();
+        walkErrors = capture.captured();
+    }
     std::printf("directories: %lu, files: %lu, other: %lu, shown: %lu, result: %d\n",
                 walkReport.directories, walkReport.files, walkReport.others, walkReport.shown,
                 result);
-    return result == -1 ? 1 : 0;
+    std::fflush(stdout);
+    bool early = reportWalk(walkErrors, walkReport.unreadable);
+    if (result == -1 && !early) {
+        oxtoolReport(OxErrorError, "the walk of " + start + " failed");
+    }
+    return result == -1 || early ? kOxToolFailed : 0;
 }
 
 void printNames(const OxFileList& list, const std::string& strip) {
@@ -140,19 +163,30 @@ void printNames(const OxFileList& list, const std::string& strip) {
     std::printf("names: %u\n", files.getLength());
 }
 
-int runList(int argc, char** argv) {
-    if (argc < 2) {
-        std::fprintf(stderr, "usage: oxtool list LISTFILE...\n");
-        return 2;
-    }
+int runList(const OxToolContext& context) {
     OxXmlFileList list;
-    for (int i = 1; i < argc; i++) {
-        list.addListFile(argv[i]);
+    for (const std::string& operand : context.operands) {
+        if (operand == "-") {
+            std::fprintf(stderr, "oxtool list: reads list files; '-' is not accepted\n");
+            return kOxToolUsage;
+        }
+        list.addListFile(operand.c_str());
     }
     std::fflush(stdout);
-    OxBool ok = list.readListFiles();
+    OxBool ok = OxFalse;
+    std::string listErrors;
+    {
+        OxToolMessageCapture capture(nullptr, true, false);
+        ok = list.readListFiles();
+        listErrors = capture.captured();
+    }
     printNames(list, "");
-    return ok == OxTrue ? 0 : 1;
+    std::fflush(stdout);
+    bool early = reportWalk(listErrors, {});
+    if (ok != OxTrue) {
+        oxtoolReport(OxErrorError, "a list file cannot be read");
+    }
+    return ok == OxTrue && !early ? 0 : kOxToolFailed;
 }
 
 // Demo: the data directory walked (paths shown relative to it, sorted, since
@@ -194,9 +228,35 @@ int demoWalk(const OxToolDemoContext& context) {
     return result == 0 && ok == OxTrue ? 0 : 1;
 }
 
-OxToolRegistration walkRegistration{{"walk", "DIR [--ext .xml] [--depth N] [--streams N]",
-                                     "walk a directory tree and print what it holds", runWalk,
-                                     demoWalk, 70}};
+OxToolRegistration walkRegistration{
+    {"walk",
+     "DIR",
+     "walk a directory tree and print what it holds",
+     "Walks DIR with the library's tree walk and prints one line per object: a letter\n"
+     "for its type (D directory, F file, N no status, U unreadable directory) and the\n"
+     "path, then a count line. The walk follows symbolic links. Two of its ways are\n"
+     "told here: a symbolic link that loops ends the walk (an error: the entries\n"
+     "behind it are missing), and a directory that cannot be listed for another\n"
+     "reason than permission, such as a path too long, is walked as empty (a\n"
+     "warning). A DIR that does not exist is an error.\n",
+     {{"ext", "TEXT", "show only paths that end in TEXT (e.g. .xml)"},
+      {"depth", "N", "enter directories down to N levels below DIR (-1: no limit)"},
+      {"streams", "N", "directory streams open at once (default 10)"}},
+     1,
+     1,
+     runWalk,
+     demoWalk,
+     70}};
 OxToolRegistration listRegistration{
-    {"list", "LISTFILE...", "read list files (directories give their .xml files)", runList}};
+    {"list",
+     "LISTFILE...",
+     "read list files (directories give their .xml files)",
+     "Reads each list file (one name a line, '#' comments) into an XML file list and\n"
+     "prints the names: a directory named in a list gives the .xml files below it, by\n"
+     "the library's tree walk. A list file that cannot be read, or a walk that ended\n"
+     "early (a symbolic link that loops), is an error.\n",
+     {},
+     1,
+     -1,
+     runList}};
 } // namespace

@@ -4,10 +4,14 @@
 //                                 with file, line and offset); write to OUT
 //   oxtool xml-dump IN.xml        print the document's dump
 //
-// Messages go through the default message file (oxbase.msg, in the working
-// directory or the bundled data directory) to standard error; the demo step
-// logs to oxtool-xml.log in its scratch directory.
+// "-" as IN is standard input, as OUT standard output: the library reads and
+// writes files by name, so the text passes through a scratch file. Messages go
+// to standard error (and the log of --log); the exit status is the worst of
+// them, so a document with a warning (an end tag that does not match) gives 4
+// and one with a syntax error 8. The demo step logs to oxtool-xml.log in its
+// scratch directory.
 #include "OxToolCommand.h"
+#include "OxToolFiles.h"
 
 #include "oxbase/diag/OxMsg.h"
 #include "oxbase/diag/OxPrt.h"
@@ -18,58 +22,91 @@
 #include <string>
 
 namespace {
-/// Starts the message subsystem on the default message file. Without a log
-/// directory there is no log file and every message reaches standard error;
-/// with one, the log is oxtool-xml.log there and only warnings and worse do.
-std::unique_ptr<OxMsg> startMessages(const std::string& dataDir, const std::string& logDir) {
-    return std::make_unique<OxMsg>("oxbase.msg", dataDir.c_str(),
-                                   logDir.empty() ? nullptr : "oxtool-xml.log",
-                                   logDir.empty() ? nullptr : logDir.c_str());
+
+/// A read that failed without a message of its own (an attribute value whose
+/// opening quote ends a line) is reported, so that no failed read ends well.
+int readFailure(OxBool read, const std::string& operand) {
+    if (read == OxTrue) {
+        return 0;
+    }
+    if (oxtoolWorst() < OxErrorError) {
+        oxtoolReport(OxErrorError, operand + ": the reader stopped before the end of the document");
+    }
+    return kOxToolFailed;
 }
 
-/// Reads `in` (and writes `out` when given); 0 on success, 1 on failure.
-int readAndWrite(const char* in, const char* out) {
-    OxXmlFile file(in, OxFile::OxIOInput);
+/// Where a document is read from: the operand, or a copy of standard input.
+bool inputPath(const std::string& operand, OxToolTempDir& scratch, std::string& path) {
+    if (operand != "-") {
+        path = operand;
+        return true;
+    }
+    path = scratch.file("stdin.xml");
+    if (scratch.path().empty() || !oxtoolCopyStdinTo(path)) {
+        oxtoolReport(OxErrorError, "cannot keep standard input in a scratch file");
+        return false;
+    }
+    return true;
+}
+
+/// Reads `in` (and writes `out` when given, "-" standing for standard
+/// output); 0, or kOxToolFailed when a file cannot be opened or written.
+int readAndWrite(const std::string& inOperand, const char* out, bool quietReport) {
+    OxToolTempDir scratch;
+    std::string in;
+    if (!inputPath(inOperand, scratch, in)) {
+        return kOxToolFailed;
+    }
+    OxXmlFile file(in.c_str(), OxFile::OxIOInput);
     if (file.isGood(OxFile::OxIOInput) != OxTrue) {
-        std::fprintf(stderr, "oxtool xml: cannot open %s\n", in);
-        return 1;
+        oxtoolReport(OxErrorError, "cannot open " + inOperand);
+        return kOxToolFailed;
     }
     OxBool read = file.readFile();
     const OxXmlElement* root = file.getRoot();
-    std::printf("%s: %s, root %s with %u child nodes\n", in, read ? "read" : "read with errors",
-                root != nullptr && root->getName() != nullptr ? root->getName() : "(none)",
-                root != nullptr ? root->getNbChildElements() : 0u);
+    bool toStdout = out != nullptr && std::string(out) == "-";
+    std::FILE* report = toStdout || quietReport ? stderr : stdout;
+    std::fprintf(report, "%s: %s, root %s with %u child nodes\n", inOperand.c_str(),
+                 read ? "read" : "read with errors",
+                 root != nullptr && root->getName() != nullptr ? root->getName() : "(none)",
+                 root != nullptr ? root->getNbChildElements() : 0u);
+    int status = readFailure(read, inOperand);
     if (out == nullptr) {
-        return read ? 0 : 1;
+        return status;
     }
-    if (file.open(out, OxFile::OxIOOutput) != 0) {
-        std::fprintf(stderr, "oxtool xml: cannot write %s\n", out);
-        return 1;
+    std::string target = toStdout ? scratch.file("stdout.xml") : out;
+    if (toStdout && scratch.path().empty()) {
+        oxtoolReport(OxErrorError, "no scratch directory for standard output");
+        return kOxToolFailed;
+    }
+    if (file.open(target.c_str(), OxFile::OxIOOutput) != 0) {
+        oxtoolReport(OxErrorError, std::string("cannot write ") + out);
+        return kOxToolFailed;
     }
     OxBool written = file.writeFile();
-    std::printf("%s: %s\n", out, written ? "written" : "written with errors");
-    return read && written ? 0 : 1;
+    if (toStdout && !oxtoolCopyToStdout(target)) {
+        oxtoolReport(OxErrorError, "cannot write standard output");
+        return kOxToolFailed;
+    }
+    std::fprintf(report, "%s: %s\n", out, written ? "written" : "written with errors");
+    return written ? status : kOxToolFailed;
 }
 
-int runXml(int argc, char** argv) {
-    if (argc < 2 || argc > 3) {
-        std::fprintf(stderr, "usage: oxtool xml IN.xml [OUT.xml]\n");
-        return 2;
-    }
-    auto msg = startMessages(OXTOOL_DEFAULT_DATA_DIR, "");
-    return readAndWrite(argv[1], argc > 2 ? argv[2] : nullptr);
+int runXml(const OxToolContext& context) {
+    return readAndWrite(context.operands[0],
+                        context.operands.size() > 1 ? context.operands[1].c_str() : nullptr, false);
 }
 
-int runXmlDump(int argc, char** argv) {
-    if (argc != 2) {
-        std::fprintf(stderr, "usage: oxtool xml-dump IN.xml\n");
-        return 2;
+int runXmlDump(const OxToolContext& context) {
+    OxToolTempDir scratch;
+    std::string in;
+    if (!inputPath(context.operands[0], scratch, in)) {
+        return kOxToolFailed;
     }
-    auto msg = startMessages(OXTOOL_DEFAULT_DATA_DIR, "");
-    OxXmlFile file(argv[1], OxFile::OxIOInput);
+    OxXmlFile file(in.c_str(), OxFile::OxIOInput);
     if (file.isGood(OxFile::OxIOInput) != OxTrue) {
-        std::fprintf(stderr, "oxtool xml-dump: cannot open %s\n", argv[1]);
-        return 1;
+        oxtoolReport(OxErrorError, "cannot open " + context.operands[0]);
+        return kOxToolFailed;
     }
     OxBool read = file.readFile();
     OxPrt prt;
@@ -79,13 +116,14 @@ int runXmlDump(int argc, char** argv) {
         std::fputs(text, stdout);
     }
     delete[] text;
-    return read ? 0 : 1;
+    return readFailure(read, context.operands[0]);
 }
 
 // Demo: the sample assembly read, a few typed values taken out of it, and
 // the document written back into the scratch directory.
 int demoXml(const OxToolDemoContext& context) {
-    auto msg = startMessages(context.dataDir, context.outDir);
+    std::string logName = oxtoolLibraryPath(oxtoolJoin(context.outDir, "oxtool-xml.log"));
+    OxMsg msg(oxtoolLibraryPath(context.messageFile).c_str(), nullptr, logName.c_str(), nullptr);
     std::string in = oxtoolJoin(context.dataDir, "assembly.xml");
     std::string out = oxtoolJoin(context.outDir, "assembly.xml");
     OxXmlFile file(in.c_str(), OxFile::OxIOInput);
@@ -108,12 +146,32 @@ int demoXml(const OxToolDemoContext& context) {
                     parts[i]->getAttributeValue(OxXmlFile::OX_XML_FIELD_COLOR),
                     indices.getLength());
     }
-    return readAndWrite(in.c_str(), out.c_str());
+    return readAndWrite(in, out.c_str(), false) == 0 ? 0 : 1;
 }
 
-OxToolRegistration xmlRegistration{{"xml", "IN.xml [OUT.xml]",
-                                    "read an XML document, report errors, write it back", runXml,
-                                    demoXml, 50}};
+OxToolRegistration xmlRegistration{
+    {"xml",
+     "IN.xml [OUT.xml]",
+     "read an XML document, report errors, write it back",
+     "Reads IN.xml with the library's reader; syntax errors are logged with file, line\n"
+     "and offset. With OUT.xml the document is written there as the library's writer\n"
+     "writes it (see 'oxtool check' for what that does not give back). IN \"-\" is\n"
+     "standard input; OUT \"-\" is standard output, and the report line then goes to\n"
+     "standard error.\n",
+     {},
+     1,
+     2,
+     runXml,
+     demoXml,
+     50}};
 OxToolRegistration xmlDumpRegistration{
-    {"xml-dump", "IN.xml", "print the dump of an XML document", runXmlDump}};
+    {"xml-dump",
+     "IN.xml",
+     "print the dump of an XML document",
+     "Reads IN.xml (\"-\": standard input) and prints the dump of the document: the\n"
+     "declaration, the nodes before and behind the root, and the element tree.\n",
+     {},
+     1,
+     1,
+     runXmlDump}};
 } // namespace

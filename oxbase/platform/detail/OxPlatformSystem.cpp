@@ -7,6 +7,7 @@
 #include <limits>
 
 #ifdef _WIN32
+#include <io.h>
 #include <windows.h>
 #else
 #include <string.h>
@@ -326,6 +327,14 @@ int OxPlatformSystemName(char* buffer, size_t size) {
         return EINVAL;
     }
     return OxPlatformStrcpy(buffer, size, names.sysname);
+#endif
+}
+
+bool OxPlatformIsTerminal(int descriptor) {
+#ifdef _WIN32
+    return _isatty(descriptor) != 0;
+#else
+    return isatty(descriptor) != 0;
 #endif
 }
 

@@ -61,6 +61,10 @@ int OxPlatformHostName(char* buffer, size_t size);
 /// The name of the operating system (uname's system name, "Microsoft Windows"
 /// on Windows) into `buffer`. Non-zero on failure.
 int OxPlatformSystemName(char* buffer, size_t size);
+/// Whether the file descriptor `descriptor` (0 standard input, 1 standard
+/// output, 2 standard error) is a terminal (`isatty`, `_isatty` on Windows).
+/// False for a file, a pipe, a closed or invalid descriptor.
+bool OxPlatformIsTerminal(int descriptor);
 
 } // namespace detail
 } // namespace oxbase
