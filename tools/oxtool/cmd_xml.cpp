@@ -46,6 +46,7 @@ int readAndWrite(const char* in, const char* out) {
         std::fprintf(stderr, "oxtool xml: cannot write %s\n", out);
         return 1;
     }
+    file.setFlushEveryLine(OxFalse); // one flush at the end: the same bytes, faster
     OxBool written = file.writeFile();
     std::printf("%s: %s\n", out, written ? "written" : "written with errors");
     return read && written ? 0 : 1;
