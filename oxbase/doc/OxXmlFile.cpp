@@ -5,6 +5,7 @@
 #include "oxbase/diag/OxMsg.h"
 #include "oxbase/diag/OxMsgNumbers.h"
 #include "oxbase/doc/detail/OxXmlReader.h"
+#include "oxbase/doc/detail/OxXmlStore.h"
 #include "oxbase/doc/detail/OxXmlTextBuffer.h"
 #include "oxbase/io/OxInput.h"
 #include "oxbase/io/OxOutput.h"
@@ -185,20 +186,21 @@ OxXmlFile::~OxXmlFile() {
     delete input;
     delete output;
     clearDocument();
+    delete store; // behind the nodes built there
 }
 
 void OxXmlFile::clearDocument() {
-    delete root;
+    OxXmlElement::release(root);
     root = nullptr;
-    delete declaration;
+    OxXmlElement::release(declaration);
     declaration = nullptr;
     doctype = nullptr; // a node of the lists or of the tree
     for (unsigned int i = 0; i < preRootNodes.length; i++) {
-        delete preRootNodes.data[i];
+        OxXmlElement::release(preRootNodes.data[i]);
     }
     preRootNodes.length = 0;
     for (unsigned int i = 0; i < postRootNodes.length; i++) {
-        delete postRootNodes.data[i];
+        OxXmlElement::release(postRootNodes.data[i]);
     }
     postRootNodes.length = 0;
 }
@@ -255,12 +257,18 @@ OxBool OxXmlFile::readFile() {
     }
     OxBool result = OxFalse;
     if (!withMemory([&] {
+            if (store == nullptr) {
+                store = new OxXmlStore;
+            }
             oxbase::detail::OxXmlReader reader(*this);
             result = reader.run();
         })) {
-        // No part of a document: what was read before the failure goes.
+        // No part of a document: what was read before the failure goes,
+        // and so does the store it was built in.
         reportNoMemory();
         clearDocument();
+        delete store;
+        store = nullptr;
         return OxFalse;
     }
     if (result && !input->isGood() && !input->eof()) {

@@ -27,6 +27,7 @@ namespace oxbase {
 namespace detail {
 class OxXmlReader;
 class OxXmlLineSink;
+class OxXmlStore;
 } // namespace detail
 } // namespace oxbase
 
@@ -163,6 +164,9 @@ private:
     OxGList<OxXmlElement*> postRootNodes;
     OxPrt prt;
     OxBool flushEveryLine = OxTrue;
+    /// Where the reader builds the nodes (doc/detail/OxXmlStore): made by the
+    /// first read, freed behind the tree.
+    oxbase::detail::OxXmlStore* store = nullptr;
 };
 
 #endif

@@ -25,6 +25,11 @@ public:
     /// The shared, trimmed text of `text`: null for a null or empty text, an
     /// empty text for one of white space alone. Each call counts one user.
     static char const* acquire(char const* text);
+    /// The same for the `length` characters at `text` (no terminator needed).
+    static char const* acquire(char const* text, std::size_t length);
+    /// One user more of a text returned by acquire (null is ignored); returns
+    /// it. For a caller that names many nodes alike.
+    static char const* share(char const* name);
     /// One user less of a text returned by acquire (null is ignored); the
     /// text is freed with its last user.
     static void release(char const* name);

@@ -7,6 +7,7 @@
 
 #include "oxbase/doc/OxXmlFile.h"
 #include "oxbase/doc/detail/OxXmlLineSource.h"
+#include "oxbase/doc/detail/OxXmlStore.h"
 #include "oxbase/doc/detail/OxXmlTextBuffer.h"
 
 #include <cstddef>
@@ -40,9 +41,15 @@ namespace detail {
 /// stored once, so the work stays linear in the size of the input.
 class OxXmlReader {
 public:
-    explicit OxXmlReader(OxXmlFile& document) : file(document), source(*document.input) {}
+    /// Reads into `document`, whose store must exist: elements, attributes
+    /// and their values are built there.
+    explicit OxXmlReader(OxXmlFile& document)
+        : file(document), store(*document.store), source(*document.input) {}
     OxXmlReader(const OxXmlReader&) = delete;
     OxXmlReader& operator=(const OxXmlReader&) = delete;
+    /// Attributes not yet handed to their element (a read left by
+    /// std::bad_alloc) are destroyed.
+    ~OxXmlReader();
 
     OxBool run();
 
@@ -94,12 +101,15 @@ private:
     void createElement(char* tagStart, char* nameBegin, char* nameEnd, bool makeCurrent);
     void closeByEndTag(char* tagStart, char* nameBegin);
     void attach(OxXmlElement* node);
+    /// Hands the attributes of the tag in progress to their element.
+    void commitAttributes();
     void finishComment(bool cdata);
     void finish();
     static char const* nameOrEmpty(char const* text) { return text != nullptr ? text : ""; }
     char const* fileName() const { return nameOrEmpty(file.input->getFilename()); }
 
     OxXmlFile& file;
+    OxXmlStore& store;
     OxXmlLineSource source;
     State state = START;
     unsigned int lineNumber = 0;
@@ -115,6 +125,10 @@ private:
     // The DOCTYPE text: gathered over the whole read, stored at its end.
     bool doctypeLoaded = false;
     OxXmlTextBuffer doctypeText;
+    // The attributes of the tag in progress, handed to their element at the
+    // tag's end as one exact list.
+    OxXmlElement* tagElement = nullptr;
+    OxGList<OxXmlAttribute*> tagAttributes;
     // The attribute in progress and its value gathered over several lines.
     OxXmlAttribute* attribute = nullptr;
     char quote = '"';
