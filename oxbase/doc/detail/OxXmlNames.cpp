@@ -41,11 +41,6 @@ std::size_t hashOf(char const* text, std::size_t length) {
     return static_cast<std::size_t>(hash);
 }
 
-/// The white space that OxString::stripWhite trims.
-bool isWhite(char c) {
-    return std::isspace(static_cast<unsigned char>(c)) != 0;
-}
-
 void placeEntry(NameEntry** slots, std::size_t capacity, NameEntry* entry) {
     std::size_t mask = capacity - 1;
     std::size_t slot = entry->hash & mask;

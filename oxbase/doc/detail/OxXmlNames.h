@@ -15,6 +15,7 @@
 #ifndef OXBASE_DOC_DETAIL_OXXMLNAMES_H
 #define OXBASE_DOC_DETAIL_OXXMLNAMES_H
 
+#include <cctype>
 #include <cstddef>
 
 namespace oxbase {
@@ -35,6 +36,15 @@ public:
     static void release(char const* name);
     /// Distinct texts in use (for tests and statistics).
     static std::size_t count();
+    /// Whether OxString::stripWhite trims `c` (std::isspace), without the
+    /// library call for the ASCII characters, whose class no locale changes.
+    static bool isWhite(char c) {
+        auto code = static_cast<unsigned char>(c);
+        if (code < 0x80) {
+            return code == ' ' || (code >= '\t' && code <= '\r');
+        }
+        return std::isspace(code) != 0;
+    }
 };
 
 } // namespace detail

@@ -6,6 +6,7 @@
 #include "oxbase/diag/OxMsgNumbers.h"
 #include "oxbase/doc/OxXmlAttribute.h"
 #include "oxbase/doc/OxXmlElement.h"
+#include "oxbase/doc/detail/OxXmlNames.h"
 #include "oxbase/io/OxInput.h"
 
 #include <cctype>
@@ -15,6 +16,38 @@
 
 namespace oxbase {
 namespace detail {
+
+OxXmlReader::NameCache::~NameCache() {
+    for (Entry& entry : slots) {
+        delete[] entry.raw;
+        OxXmlNames::release(entry.shared);
+    }
+}
+
+char const* OxXmlReader::NameCache::lookup(char const* text, size_t length) {
+    if (length == 0) {
+        return nullptr;
+    }
+    size_t slot = (length * 31 + static_cast<unsigned char>(text[0]) +
+                   static_cast<unsigned char>(text[length - 1]) * 7) %
+                  kSlots;
+    Entry& entry = slots[slot];
+    if (entry.raw != nullptr && entry.length == length &&
+        std::memcmp(entry.raw, text, length) == 0) {
+        return entry.shared;
+    }
+    // A new name: its shared text and a copy of the raw text first, so that
+    // the entry is replaced only when both are there.
+    std::unique_ptr<char[]> raw(new char[length]);
+    std::memcpy(raw.get(), text, length);
+    char const* shared = OxXmlNames::acquire(text, length);
+    delete[] entry.raw;
+    OxXmlNames::release(entry.shared);
+    entry.raw = raw.release();
+    entry.length = length;
+    entry.shared = shared;
+    return shared;
+}
 
 OxXmlReader::~OxXmlReader() {
     for (unsigned int i = 0; i < tagAttributes.length; i++) {
@@ -53,10 +86,10 @@ OxBool OxXmlReader::run() {
         }
         char* begin = line;
         char* end = line + length;
-        while (begin < end && std::isspace(static_cast<unsigned char>(*begin))) {
+        while (begin < end && OxXmlNames::isWhite(*begin)) {
             begin++;
         }
-        while (end > begin && std::isspace(static_cast<unsigned char>(end[-1]))) {
+        while (end > begin && OxXmlNames::isWhite(end[-1])) {
             end--;
         }
         if (begin == end) {
@@ -133,20 +166,23 @@ int OxXmlReader::doContent() {
         return kGoOn;
     }
     cursor = open;
-    if (file.isDeclaration(cursor)) {
-        return OxMsgXmlInnerDeclaration;
-    }
-    if (file.isComment(cursor)) {
-        state = COMMENT;
-        return kGoOn;
-    }
-    if (file.isDoctype(cursor)) {
-        state = DOCTYPE;
-        return kGoOn;
-    }
-    if (file.isCdata(cursor)) {
-        state = CDATA;
-        return kGoOn;
+    // Every marker begins "<?" or "<!": a tag needs none of the comparisons.
+    if (open[1] == '?' || open[1] == '!') {
+        if (file.isDeclaration(cursor)) {
+            return OxMsgXmlInnerDeclaration;
+        }
+        if (file.isComment(cursor)) {
+            state = COMMENT;
+            return kGoOn;
+        }
+        if (file.isDoctype(cursor)) {
+            state = DOCTYPE;
+            return kGoOn;
+        }
+        if (file.isCdata(cursor)) {
+            state = CDATA;
+            return kGoOn;
+        }
     }
     char* nameBegin = cursor + 1;
     while (nameBegin < lineEnd && *nameBegin == ' ') {
@@ -236,8 +272,8 @@ int OxXmlReader::doAttribute() {
                 commitAttributes();
                 tagElement = current;
             }
-            OxXmlAttribute* made =
-                store.newAttribute(nameBegin, static_cast<size_t>(nameEnd - nameBegin));
+            OxXmlAttribute* made = store.newAttributeShared(
+                names.lookup(nameBegin, static_cast<size_t>(nameEnd - nameBegin)));
             if (!withMemory([&] { tagAttributes.append(made); })) {
                 OxXmlStore::discard(made);
                 throw std::bad_alloc();
@@ -373,7 +409,8 @@ int OxXmlReader::doDoctype() {
 
 void OxXmlReader::createElement(char* tagStart, char* nameBegin, char* nameEnd, bool makeCurrent) {
     commitAttributes();
-    OxXmlElement* element = store.newElement(nameBegin, static_cast<size_t>(nameEnd - nameBegin));
+    OxXmlElement* element =
+        store.newElementShared(names.lookup(nameBegin, static_cast<size_t>(nameEnd - nameBegin)));
     // Until a place in the document has it, the element is destroyed when
     // memory runs out.
     bool placed = withMemory([&] {

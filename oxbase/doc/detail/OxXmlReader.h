@@ -40,6 +40,30 @@ namespace detail {
 /// keep their bytes. Texts gathered over many lines grow in place and are
 /// stored once, so the work stays linear in the size of the input.
 class OxXmlReader {
+    /// The names of a document repeat: the raw text of a tag or attribute
+    /// name is looked up here first, and the shared text (OxXmlNames) only
+    /// when the name is new to the cache. Each entry holds one use of its
+    /// name; the cache gives them back at its end.
+    class NameCache {
+    public:
+        NameCache() = default;
+        NameCache(const NameCache&) = delete;
+        NameCache& operator=(const NameCache&) = delete;
+        ~NameCache();
+        /// The shared text of the `length` raw characters at `text`, as
+        /// OxXmlNames::acquire makes it; the cache keeps the use.
+        char const* lookup(char const* text, size_t length);
+
+    private:
+        struct Entry {
+            char const* raw = nullptr; ///< the raw text, a copy owned here
+            size_t length = 0;
+            char const* shared = nullptr;
+        };
+        static constexpr size_t kSlots = 64;
+        Entry slots[kSlots];
+    };
+
 public:
     /// Reads into `document`, whose store must exist: elements, attributes
     /// and their values are built there.
@@ -110,6 +134,7 @@ private:
 
     OxXmlFile& file;
     OxXmlStore& store;
+    NameCache names;
     OxXmlLineSource source;
     State state = START;
     unsigned int lineNumber = 0;

@@ -13,16 +13,16 @@ namespace oxbase {
 namespace detail {
 
 namespace {
-/// Slabs start at 64 KiB and double up to 1 MiB: a small document takes
-/// little, a large one few slabs.
-constexpr std::size_t kFirstSlab = 64 * 1024;
-constexpr std::size_t kLargestSlab = 1024 * 1024;
+/// Slabs of 60 KiB: below the size from which the heap maps fresh pages for
+/// each block (128 KiB with glibc), so that the slabs of a document that went
+/// are taken again by the next one instead of new memory from the system.
+constexpr std::size_t kFirstSlab = 60 * 1024;
+constexpr std::size_t kLargestSlab = 60 * 1024;
 /// The slab header, rounded to the largest fundamental alignment.
 constexpr std::size_t kHeader = 16;
 
-/// The white space that OxString::stripWhite trims.
 bool isWhite(char c) {
-    return std::isspace(static_cast<unsigned char>(c)) != 0;
+    return OxXmlNames::isWhite(c);
 }
 
 /// An attribute list that is an exact array in the store: the list object
