@@ -160,7 +160,8 @@ void OxXmlStore::addAttributes(OxXmlElement* element, OxXmlAttribute* const* lis
         return;
     }
     using List = OxGList<OxXmlAttribute*>;
-    void* memory = allocate(sizeof(List) + count * sizeof(OxXmlAttribute*));
+    // The slots are pointers to attributes.
+    void* memory = allocate(sizeof(List) + count * sizeof(void*));
     List* stored = storedList<OxXmlAttribute*>(memory, count);
     for (unsigned int i = 0; i < count; i++) {
         stored->data[i] = list[i];
