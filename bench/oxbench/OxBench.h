@@ -3,8 +3,9 @@
 //
 // Every implementation of a case is a Runner that registers itself with a
 // static OxBenchRegistration. The harness runs each runner in a child process
-// (so a crash or a runaway case costs one row, not the table), does one
-// warm-up run and then the timed runs, and prints the median.
+// of its own (the oxbench program itself, started again with --child), so a
+// crash or a runaway case costs one row, not the table, and each heap regime
+// gets the process it needs; it prints the median of the timed runs.
 //
 //   class MyRunner : public oxbench::Runner { ... };
 //   static oxbench::Registration reg("csv-read", "getline+split",
@@ -24,8 +25,10 @@ namespace oxbench {
 struct Corpus {
     std::string dir;         ///< the temporary directory, removed at exit
     std::string xmlModel;    ///< the XML model in the writer's layout
+    std::string xmlDense;    ///< the dense XML model: many small elements, short attributes
     std::string xmlComment;  ///< a document that is one long multi-line comment
     std::string csvTable;    ///< the CSV table, header line first
+    std::string csvDense;    ///< the dense CSV table: ten short fields in every record
     std::string doubles;     ///< big-endian doubles, no framing
     std::string tree;        ///< root of the directory tree
     std::string messageFile; ///< message file with the bench's own message
@@ -35,6 +38,11 @@ struct Corpus {
     std::size_t rangeRecords = 0;
     std::size_t rangeMembers = 0;
     std::size_t treeEntries = 0; ///< directories + files + the root itself
+    /// The shape a document case reads in this process: the dense corpora
+    /// when set (set by the harness per row, before prepare).
+    bool dense = false;
+    const std::string& xmlInput() const { return dense ? xmlDense : xmlModel; }
+    const std::string& csvInput() const { return dense ? csvDense : csvTable; }
 };
 
 /// The message the message case logs: number, its text in the message file.
@@ -58,6 +66,12 @@ public:
     /// runner cannot work with this corpus.
     virtual bool prepare(const Corpus& corpus, std::string& note) {
         (void)corpus;
+        (void)note;
+        return true;
+    }
+    /// Untimed, before each run (a case that times the end of something
+    /// builds it here). Returns false (and a note) when it cannot.
+    virtual bool beforeRun(std::string& note) {
         (void)note;
         return true;
     }

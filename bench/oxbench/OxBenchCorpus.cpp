@@ -1,6 +1,6 @@
-// Corpus generation: XML model in the writer's layout, a one-comment XML
-// document, a CSV table with empty fields, big-endian doubles, a directory
-// tree and the bench message file.
+// Corpus generation: XML model in the writer's layout and a dense XML model,
+// a one-comment XML document, a CSV table with empty fields and a dense one,
+// big-endian doubles, a directory tree and the bench message file.
 #include "OxBenchCorpus.h"
 
 #include <cstdint>
@@ -205,6 +205,104 @@ bool writeCsv(const std::string& path, std::uint64_t target) {
     return out.close();
 }
 
+// The dense model: many small elements with short attributes (about 11,500
+// elements and 29,000 attributes per MB), nested three levels deep.
+bool writeXmlDense(const std::string& path, std::uint64_t target, CorpusStats& stats) {
+    Sink out(path);
+    Lcg rng;
+    static const char* kinds[] = {"hex-bolt-m8-zinc-plated", "lock-nut-m8-zinc-plated",
+                                  "flat-washer-form-a",      "dowel-pin-6-hardened",
+                                  "blind-rivet-open-end",    "spring-clip-phosphated"};
+    static const char* materials[] = {"stainless-steel", "brass-cw614n", "nylon-pa66",
+                                      "aluminium-6061"};
+    static const char* params[] = {"width-nominal", "height-nominal", "depth-nominal",
+                                   "offset-nominal", "angle-nominal"};
+    static const char* notes[] = {"checked", "mirrored", "imported", "rework"};
+    static const char* layers[] = {"frame-left-upper", "cover-top-outer", "base-plate-lower",
+                                   "mount-rear-inner"};
+    out << "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n\n";
+    out << "<model name=\"dense\" units=\"mm\">\n";
+    stats.elements = 1;
+    stats.attributes = 2;
+    for (long long g = 0; out.size() < target; g++) {
+        out << blanks(1) << "<group id=\"G" << g << "\" kind=\"fixture\" layer=\"" << layers[g % 4]
+            << "\">\n";
+        stats.elements++;
+        stats.attributes += 3;
+        for (int s = 0; s < 4; s++) {
+            out << blanks(2) << "<set id=\"S" << g << "." << s << "\" layer=\""
+                << layers[rng.next() % 4] << "\">\n";
+            stats.elements++;
+            stats.attributes += 2;
+            for (int m = 0; m < 6; m++) {
+                long long id = 1000000 + g * 24 + s * 6 + m;
+                switch (rng.next() % 6) {
+                case 0:
+                case 1:
+                    out << blanks(3) << "<member id=\"M-ASM-" << id << "\" kind=\""
+                        << kinds[rng.next() % 6] << "\" material=\"" << materials[rng.next() % 4]
+                        << "\" layer=\"" << layers[rng.next() % 4] << "\"/>\n";
+                    stats.attributes += 4;
+                    break;
+                case 2:
+                    out << blanks(3) << "<edge from=\"N-NODE-" << 100000 + rng.next() % 900000
+                        << "\" to=\"N-NODE-" << 100000 + rng.next() % 900000
+                        << "\" kind=\"weld-seam-continuous\"/>\n";
+                    stats.attributes += 3;
+                    break;
+                case 3:
+                    out << blanks(3) << "<param name=\"" << params[rng.next() % 5] << "\" value=\""
+                        << numberText(rng.grid(-100, 100, 64))
+                        << "\" unit=\"millimetre-at-20C\"/>\n";
+                    stats.attributes += 3;
+                    break;
+                case 4:
+                    out << blanks(3) << "<ref part=\"PART-" << 10000 + rng.next() % 90000
+                        << "\" count=\"" << 1 + rng.next() % 8 << "\" revision=\"B\"/>\n";
+                    stats.attributes += 3;
+                    break;
+                default:
+                    out << blanks(3) << "<note>" << notes[rng.next() % 4] << " by assembly station "
+                        << rng.next() % 100 << "</note>\n";
+                    break;
+                }
+                stats.elements++;
+            }
+            out << blanks(2) << "</set>\n";
+        }
+        out << blanks(1) << "</group>\n";
+    }
+    out << "</model>\n";
+    return out.close();
+}
+
+// The dense table: ten short fields in every record, none empty, about
+// 12,500 records per MB.
+bool writeCsvDense(const std::string& path, std::uint64_t target, CorpusStats& stats) {
+    Sink out(path);
+    Lcg rng;
+    static const char* codes[] = {"AB", "BC", "CD", "DE", "EF", "FG"};
+    out << "id,code,qty,x,y,z,rev,lot,bin,flag\n";
+    stats.records = 0;
+    for (long long row = 0; out.size() < target; row++) {
+        std::string line = std::to_string(100000 + row);
+        line += ",";
+        line += codes[rng.next() % 6];
+        line += "-" + std::to_string(1000 + rng.next() % 9000) + "-X";
+        line += "," + std::to_string(rng.next() % 1000);
+        for (int k = 0; k < 3; k++) {
+            line += "," + numberText(rng.grid(-1000, 1000, 64));
+        }
+        line += "," + std::to_string(rng.next() % 100);
+        line += ",LOT-2026-" + std::to_string(10000 + rng.next() % 90000);
+        line += "," + std::to_string(rng.next() % 5000);
+        line += rng.next() % 2 == 0 ? ",yes" : ",no";
+        out << line << "\n";
+        stats.records++;
+    }
+    return out.close();
+}
+
 bool writeDoubles(const std::string& path, std::size_t count) {
     std::FILE* file = std::fopen(path.c_str(), "wb");
     if (file == nullptr) {
@@ -338,20 +436,13 @@ std::vector<std::string> writerLines(const std::string& path) {
     return lines;
 }
 
-bool generateCorpus(Corpus& corpus, bool quick, std::string& error) {
-    const char* tmp = std::getenv("TMPDIR");
-    std::string templ = (tmp != nullptr && *tmp != '\0' ? std::string(tmp) : std::string("/tmp")) +
-                        "/oxbench.XXXXXX";
-    std::string buffer = templ;
-    if (mkdtemp(&buffer[0]) == nullptr) {
-        error = "cannot create a temporary directory from " + templ;
-        return false;
-    }
-    corpus.dir = buffer;
-    const std::uint64_t textBytes = quick ? 4000000 : 40000000;
+void describeCorpus(Corpus& corpus, const std::string& dir, bool quick) {
+    corpus.dir = dir;
     corpus.xmlModel = corpus.dir + "/model.xml";
+    corpus.xmlDense = corpus.dir + "/dense.xml";
     corpus.xmlComment = corpus.dir + "/comment.xml";
     corpus.csvTable = corpus.dir + "/table.csv";
+    corpus.csvDense = corpus.dir + "/dense.csv";
     corpus.doubles = corpus.dir + "/doubles.bin";
     corpus.tree = corpus.dir + "/tree";
     corpus.messageFile = corpus.dir + "/oxbench.msg";
@@ -360,15 +451,37 @@ bool generateCorpus(Corpus& corpus, bool quick, std::string& error) {
     corpus.nbMessages = quick ? 100000 : 1000000;
     corpus.rangeRecords = quick ? 10000 : 100000;
     corpus.rangeMembers = quick ? 1000000 : 10000000;
+    // The tree of writeTree: the root, then per top directory itself, ten
+    // middle directories with 20 files and 29 leaves of 20 files each.
+    std::size_t top = quick ? 1 : 10;
+    corpus.treeEntries = 1 + top * (1 + 10 * (1 + 20 + 29 * (1 + 20)));
+}
+
+bool generateCorpus(Corpus& corpus, bool quick, CorpusStats& stats, std::string& error) {
+    const char* tmp = std::getenv("TMPDIR");
+    std::string templ = (tmp != nullptr && *tmp != '\0' ? std::string(tmp) : std::string("/tmp")) +
+                        "/oxbench.XXXXXX";
+    std::string buffer = templ;
+    if (mkdtemp(&buffer[0]) == nullptr) {
+        error = "cannot create a temporary directory from " + templ;
+        return false;
+    }
+    describeCorpus(corpus, buffer, quick);
+    const std::uint64_t textBytes = quick ? 4000000 : 40000000;
+    std::size_t treeEntries = 0;
     if (!writeXmlModel(corpus.xmlModel, textBytes)) {
         error = "cannot write " + corpus.xmlModel;
+    } else if (!writeXmlDense(corpus.xmlDense, textBytes, stats)) {
+        error = "cannot write " + corpus.xmlDense;
     } else if (!writeXmlComment(corpus.xmlComment, textBytes)) {
         error = "cannot write " + corpus.xmlComment;
     } else if (!writeCsv(corpus.csvTable, textBytes)) {
         error = "cannot write " + corpus.csvTable;
+    } else if (!writeCsvDense(corpus.csvDense, textBytes, stats)) {
+        error = "cannot write " + corpus.csvDense;
     } else if (!writeDoubles(corpus.doubles, corpus.nbDoubles)) {
         error = "cannot write " + corpus.doubles;
-    } else if (!writeTree(corpus.tree, quick, corpus.treeEntries)) {
+    } else if (!writeTree(corpus.tree, quick, treeEntries) || treeEntries != corpus.treeEntries) {
         error = "cannot build the tree below " + corpus.tree;
     } else if (!writeMessageFile(corpus.messageFile) || !makeDir(corpus.logDir)) {
         error = "cannot write the message file or log directory";

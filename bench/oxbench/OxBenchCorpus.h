@@ -11,10 +11,21 @@
 
 namespace oxbench {
 
+/// Counts of the dense corpora, for the table's heading.
+struct CorpusStats {
+    std::size_t elements = 0;   ///< elements of the dense XML model
+    std::size_t attributes = 0; ///< attributes of the dense XML model
+    std::size_t records = 0;    ///< records of the dense CSV table
+};
+
+/// The paths and counts of a corpus below `dir` (nothing is written): what a
+/// child process needs to find the corpus its parent generated.
+void describeCorpus(Corpus& corpus, const std::string& dir, bool quick);
+
 /// Creates the temporary directory and writes every corpus into it. `quick`
 /// makes each corpus about a tenth of the full size. On failure returns false
 /// with a reason in `error`.
-bool generateCorpus(Corpus& corpus, bool quick, std::string& error);
+bool generateCorpus(Corpus& corpus, bool quick, CorpusStats& stats, std::string& error);
 
 /// The number text of the document model: fixed with nine decimals, trailing
 /// zeros cut but one digit kept behind the point ("2.0", "-0.25").

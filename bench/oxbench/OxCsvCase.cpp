@@ -16,7 +16,7 @@ namespace {
 class OxCsvRead : public Runner {
 public:
     bool prepare(const Corpus& corpus, std::string&) override {
-        path = corpus.csvTable;
+        path = corpus.csvInput();
         return true;
     }
     Outcome run() override { return readDocument(path, file); }

@@ -1,5 +1,7 @@
-// OxBase side of the XML cases: OxXmlFile::readFile of the model and of the
-// comment document, and OxXmlFile::writeFile of the model as it was read.
+// OxBase side of the XML cases: OxXmlFile::readFile of the models and of the
+// comment document, the destruction of a read document, and
+// OxXmlFile::writeFile of a model as it was read, flushed at every line (the
+// default) and unflushed (setFlushEveryLine(OxFalse)).
 #include "OxBench.h"
 #include "OxBenchCorpus.h"
 #include "OxBenchDocument.h"
@@ -31,7 +33,7 @@ class OxXmlRead : public Runner {
 public:
     explicit OxXmlRead(bool comment) : comment(comment) {}
     bool prepare(const Corpus& corpus, std::string&) override {
-        path = comment ? corpus.xmlComment : corpus.xmlModel;
+        path = comment ? corpus.xmlComment : corpus.xmlInput();
         return true;
     }
     Outcome run() override { return readDocument(path, file); }
@@ -50,11 +52,41 @@ Registration oxXmlRead("xml-read", "OxBase OxXmlFile::readFile",
 Registration oxXmlComment("xml-read-comment", "OxBase OxXmlFile::readFile",
                           [] { return std::make_unique<OxXmlRead>(true); });
 
+// The end of a read document: the read is untimed, the destructor timed.
+class OxXmlDestroy : public Runner {
+public:
+    bool prepare(const Corpus& corpus, std::string&) override {
+        path = corpus.xmlInput();
+        return true;
+    }
+    bool beforeRun(std::string& note) override {
+        Outcome read = readDocument(path, file);
+        note = read.note;
+        elements = countElements(file->getRoot());
+        return read.ok;
+    }
+    Outcome run() override {
+        file.reset();
+        Outcome outcome;
+        outcome.amount = static_cast<double>(fileSize(path));
+        outcome.check = elements;
+        return outcome;
+    }
+
+private:
+    std::string path;
+    std::unique_ptr<OxXmlFile> file;
+    double elements = 0;
+};
+Registration oxXmlDestroy("xml-destroy", "OxBase ~OxXmlFile",
+                          [] { return std::make_unique<OxXmlDestroy>(); });
+
 class OxXmlWrite : public Runner {
 public:
+    explicit OxXmlWrite(bool flushEveryLine) : flushEveryLine(flushEveryLine) {}
     bool prepare(const Corpus& corpus, std::string& note) override {
-        model = corpus.xmlModel;
-        out = corpus.dir + "/write-oxbase.xml";
+        model = corpus.xmlInput();
+        out = corpus.dir + (flushEveryLine ? "/write-oxbase.xml" : "/write-oxbase-unflushed.xml");
         file = std::make_unique<OxXmlFile>(model.c_str(), OxFile::OxIOInput);
         if (file->readFile() != OxTrue) {
             note = "readFile of the model answered OxFalse";
@@ -64,6 +96,7 @@ public:
             note = "cannot open " + out;
             return false;
         }
+        file->setFlushEveryLine(flushEveryLine ? OxTrue : OxFalse);
         return true;
     }
     // Each run rewinds the one output stream and writes the document again
@@ -95,13 +128,16 @@ public:
     }
 
 private:
+    bool flushEveryLine;
     std::string model;
     std::string out;
     std::unique_ptr<OxXmlFile> file;
     bool compared = false;
 };
 Registration oxXmlWrite("xml-write", "OxBase OxXmlFile::writeFile",
-                        [] { return std::make_unique<OxXmlWrite>(); });
+                        [] { return std::make_unique<OxXmlWrite>(true); });
+Registration oxXmlWriteUnflushed("xml-write", "OxBase OxXmlFile::writeFile, unflushed",
+                                 [] { return std::make_unique<OxXmlWrite>(false); });
 
 } // namespace
 } // namespace oxbench

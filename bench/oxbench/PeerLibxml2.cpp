@@ -31,7 +31,7 @@ public:
     }
     bool prepare(const Corpus& corpus, std::string&) override {
         xmlInitParser();
-        path = comment ? corpus.xmlComment : corpus.xmlModel;
+        path = comment ? corpus.xmlComment : corpus.xmlInput();
         return true;
     }
     Outcome run() override {

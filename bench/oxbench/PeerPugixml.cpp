@@ -28,7 +28,7 @@ class PugiRead : public Runner {
 public:
     explicit PugiRead(bool comment) : comment(comment) {}
     bool prepare(const Corpus& corpus, std::string&) override {
-        path = comment ? corpus.xmlComment : corpus.xmlModel;
+        path = comment ? corpus.xmlComment : corpus.xmlInput();
         return true;
     }
     Outcome run() override {
@@ -61,7 +61,7 @@ class PugiWrite : public Runner {
 public:
     bool prepare(const Corpus& corpus, std::string& note) override {
         out = corpus.dir + "/write-pugixml.xml";
-        pugi::xml_parse_result result = doc.load_file(corpus.xmlModel.c_str(), kParse);
+        pugi::xml_parse_result result = doc.load_file(corpus.xmlInput().c_str(), kParse);
         note = result.description();
         return static_cast<bool>(result);
     }

@@ -22,7 +22,7 @@ class Tinyxml2Read : public Runner {
 public:
     explicit Tinyxml2Read(bool comment) : comment(comment) {}
     bool prepare(const Corpus& corpus, std::string&) override {
-        path = comment ? corpus.xmlComment : corpus.xmlModel;
+        path = comment ? corpus.xmlComment : corpus.xmlInput();
         return true;
     }
     Outcome run() override {
@@ -54,7 +54,7 @@ class Tinyxml2Write : public Runner {
 public:
     bool prepare(const Corpus& corpus, std::string& note) override {
         out = corpus.dir + "/write-tinyxml2.xml";
-        if (doc.LoadFile(corpus.xmlModel.c_str()) != tinyxml2::XML_SUCCESS) {
+        if (doc.LoadFile(corpus.xmlInput().c_str()) != tinyxml2::XML_SUCCESS) {
             note = doc.ErrorStr();
             return false;
         }

@@ -22,7 +22,7 @@ namespace {
 class CsvGetline : public Runner {
 public:
     bool prepare(const Corpus& corpus, std::string&) override {
-        path = corpus.csvTable;
+        path = corpus.csvInput();
         return true;
     }
     Outcome run() override {
@@ -151,7 +151,7 @@ Registration binaryFread("binary-memory", "fread 1 MiB blocks + swap",
 class XmlWriteOfstream : public Runner {
 public:
     bool prepare(const Corpus& corpus, std::string&) override {
-        lines = writerLines(corpus.xmlModel);
+        lines = writerLines(corpus.xmlInput());
         out = corpus.dir + "/write-ofstream.xml";
         return !lines.empty();
     }

@@ -1,9 +1,10 @@
 // oxbench main: options, corpus generation, the child-process runner and the
 // Markdown table.
 //
-//   oxbench                  full corpora, 5 timed runs per row
+//   oxbench                  full corpora, 5 timed runs per row, every regime
 //   oxbench --quick          corpora of a tenth of the size
 //   oxbench --case xml-read  one case only (repeatable)
+//   oxbench --regime warm    one heap regime (warm, default, cold or all)
 //   oxbench --runs 7 --timeout 300 --keep
 #include "OxBench.h"
 #include "OxBenchCorpus.h"
@@ -21,12 +22,10 @@
 #include <filesystem>
 #include <fstream>
 #include <iostream>
-#include <map>
 #include <sstream>
 #include <string>
 #include <vector>
 
-#include <malloc.h>
 #include <poll.h>
 #include <sys/resource.h>
 #include <sys/wait.h>
@@ -58,62 +57,219 @@ namespace {
 
 using namespace oxbench;
 
-// One row of the table: which case, which implementation, and whether it is
-// the reference the other rows of the case are compared with.
+// ---- Regimes ----------------------------------------------------------------
+//
+// warm     the allocator keeps what is freed: the child is this program started
+//          again (execve) with GLIBC_TUNABLES=glibc.malloc.mmap_max=0:
+//          glibc.malloc.trim_threshold=4294967295 in its environment. glibc
+//          reads the tunables once, when the process starts, so a forked child
+//          could not get them; mallopt in a forked child would, but that child
+//          would also carry the parent's heap (the corpus generator's blocks)
+//          and pay copy-on-write faults on it. A fresh process has neither.
+//          After the warm-up run every run reuses the freed memory and pays
+//          for the parsing work only.
+// default  plain glibc malloc in a fresh process: large blocks come from mmap
+//          and go back at free, the top of the heap is trimmed.
+// cold     one timed run in a fresh process, no warm-up: every page touched
+//          is new. The median is taken over one fresh process per run.
+enum class Regime { Warm, Default, Cold, Fresh };
+
+const char* regimeName(Regime regime) {
+    switch (regime) {
+    case Regime::Warm:
+        return "warm";
+    case Regime::Default:
+        return "default";
+    case Regime::Cold:
+        return "cold";
+    case Regime::Fresh:
+        break;
+    }
+    return "fresh process";
+}
+
+const char* const kWarmTunables =
+    "GLIBC_TUNABLES=glibc.malloc.mmap_max=0:glibc.malloc.trim_threshold=4294967295";
+
+// ---- Rows and targets ---------------------------------------------------------
+
+// A target of a row. Ratio: the time of `otherImpl` in the same case and
+// regime (the case's reference when null) divided by the row's time is at
+// least the need of the regime. Memory: the peak is at most `need` times the
+// file. Fraction: the row's time is at most `need` times the time of
+// `otherImpl` in case `otherCase`, same regime. Under: the row takes less
+// than `need` seconds.
+struct Target {
+    enum Kind { None, Ratio, Memory, Fraction, Under } kind = None;
+    const char* otherCase = nullptr;
+    const char* otherImpl = nullptr;
+    double needWarm = 0.0, needDefault = 0.0, needCold = 0.0;
+    const char* label = "";
+    double need(Regime regime) const {
+        return regime == Regime::Warm ? needWarm : regime == Regime::Cold ? needCold : needDefault;
+    }
+};
+
+Target ratio(const char* impl, double warm, double def, double cold, const char* label) {
+    return Target{Target::Ratio, nullptr, impl, warm, def, cold, label};
+}
+Target memoryTimes(double limit, const char* label) {
+    return Target{Target::Memory, nullptr, nullptr, limit, limit, limit, label};
+}
+Target fraction(const char* otherCase, const char* otherImpl, double limit, const char* label) {
+    return Target{Target::Fraction, otherCase, otherImpl, limit, limit, limit, label};
+}
+
+// One row of the table: the case as printed, the registered case it runs,
+// which corpus shape, which implementation, whether it is the reference of
+// its case, and its targets.
 struct RowSpec {
     const char* caseName;
+    const char* entryCase;
+    bool dense;
     const char* impl;
     bool reference;
-    const char* target; // the target for this row, or ""
+    Target targets[2];
+    bool memory() const { return std::strstr(caseName, "-memory") != nullptr; }
 };
+
+constexpr const char* kOxRead = "OxBase OxXmlFile::readFile";
+constexpr const char* kOxCsv = "OxBase OxCsvFile::readFile";
+constexpr const char* kTiny = "tinyxml2 LoadFile";
+constexpr const char* kPugi = "pugixml load_file";
+constexpr const char* kLibxml = "libxml2 xmlReadFile";
+constexpr const char* kOxWrite = "OxBase OxXmlFile::writeFile";
+constexpr const char* kOxWriteUnflushed = "OxBase OxXmlFile::writeFile, unflushed";
+constexpr const char* kGetline = "getline + split, all rows kept";
+
+const Target kReadTargets[2] = {ratio(kTiny, 1.0, 1.0, 1.0, ">= 1.0x tinyxml2"),
+                                ratio(kPugi, 0.5, 1.0, 1.0, ">= 1.0x pugixml (warm 0.5x)")};
+
+#define OX_XML_READ_ROWS(name, dense)                                                              \
+    {name, "xml-read", dense, kOxRead, false, {kReadTargets[0], kReadTargets[1]}},                 \
+        {name, "xml-read", dense, kTiny, true, {}}, {name, "xml-read", dense, kPugi, false, {}}, { \
+        name, "xml-read", dense, kLibxml, false, {}                                                \
+    }
+#define OX_XML_MEMORY_ROWS(name, dense)                                                            \
+    {name, "xml-read", dense, kOxRead, false, {memoryTimes(2.5, "<= 2.5x file size")}},            \
+        {name, "xml-read", dense, kTiny, true, {}}, {name, "xml-read", dense, kPugi, false, {}}, { \
+        name, "xml-read", dense, kLibxml, false, {}                                                \
+    }
+#define OX_XML_WRITE_ROWS(name, dense)                                                             \
+    {name,     "xml-write", dense,                                                                 \
+     kOxWrite, false,       {ratio(nullptr, 0.9, 0.9, 0.9, ">= 0.9x ofstream")}},                  \
+        {name, "xml-write", dense, "ofstream, flush per line", true, {}},                          \
+        {name,  "xml-write",                                                                       \
+         dense, kOxWriteUnflushed,                                                                 \
+         false, {ratio("pugixml save_file", 1.0, 1.0, 1.0, ">= 1.0x pugixml save_file")}},         \
+        {name, "xml-write", dense, "tinyxml2 SaveFile", false, {}}, {                              \
+        name, "xml-write", dense, "pugixml save_file", false, {}                                   \
+    }
 
 // The table in the order it is printed. Rows whose runner is not registered
 // (class or peer library missing) are printed as "not built".
 const RowSpec kRows[] = {
-    {"xml-read", "OxBase OxXmlFile::readFile", false, ">= 1.0x tinyxml2"},
-    {"xml-read", "tinyxml2 LoadFile", true, ""},
-    {"xml-read", "pugixml load_file", false, ""},
-    {"xml-read", "libxml2 xmlReadFile", false, ""},
-    {"xml-read-memory", "OxBase OxXmlFile::readFile", false, "<= 3x file size"},
-    {"xml-read-memory", "tinyxml2 LoadFile", true, ""},
-    {"xml-read-memory", "pugixml load_file", false, ""},
-    {"xml-read-memory", "libxml2 xmlReadFile", false, ""},
-    {"xml-read-comment", "OxBase OxXmlFile::readFile", false, "<= 2x OxBase model read time"},
-    {"xml-read-comment", "tinyxml2 LoadFile", true, ""},
-    {"xml-read-comment", "pugixml load_file", false, ""},
-    {"xml-read-comment", "libxml2 xmlReadFile", false, ""},
-    {"xml-write", "OxBase OxXmlFile::writeFile", false, ">= 0.9x ofstream"},
-    {"xml-write", "ofstream, flush per line", true, ""},
-    {"xml-write", "tinyxml2 SaveFile", false, ""},
-    {"xml-write", "pugixml save_file", false, ""},
-    {"csv-read", "OxBase OxCsvFile::readFile", false, ">= 1.0x getline+split"},
-    {"csv-read", "getline + split, all rows kept", true, ""},
-    {"binary-file", "OxBase OxInput::read(double&)", false, ">= 0.8x ifstream"},
-    {"binary-file", "ifstream::read 8 bytes + swap", true, ""},
-    {"binary-memory", "OxBase OxMemory::read(double&)", false, ">= 0.5x fread"},
-    {"binary-memory", "fread 1 MiB blocks + swap", true, ""},
-    {"walk", "OxBase OxFileTreeWalk, 10 slots", false, ">= 0.8x nftw"},
-    {"walk", "nftw FTW_PHYS", true, ""},
-    {"messages", "OxBase OxMsg::Log by number", false, ">= 0.8x ofstream"},
-    {"messages", "ofstream, flush per line", true, ""},
-    {"range-walk", "OxBase OxRangeList walk", false, "< 1 s"},
-    {"range-walk", "vector of ranges, nested loop", true, ""},
+    OX_XML_READ_ROWS("xml-read", false),
+    OX_XML_READ_ROWS("xml-read-dense", true),
+    OX_XML_MEMORY_ROWS("xml-read-memory", false),
+    OX_XML_MEMORY_ROWS("xml-read-memory-dense", true),
+    {"xml-destroy",
+     "xml-destroy",
+     false,
+     "OxBase ~OxXmlFile",
+     false,
+     {fraction("xml-read", kOxRead, 0.25, "<= 0.25x OxBase read")}},
+    {"xml-destroy-dense",
+     "xml-destroy",
+     true,
+     "OxBase ~OxXmlFile",
+     false,
+     {fraction("xml-read-dense", kOxRead, 0.25, "<= 0.25x OxBase read")}},
+    {"xml-read-comment",
+     "xml-read-comment",
+     false,
+     kOxRead,
+     false,
+     {fraction("xml-read", kOxRead, 2.0, "<= 2x OxBase model read")}},
+    {"xml-read-comment", "xml-read-comment", false, kTiny, true, {}},
+    {"xml-read-comment", "xml-read-comment", false, kPugi, false, {}},
+    {"xml-read-comment", "xml-read-comment", false, kLibxml, false, {}},
+    OX_XML_WRITE_ROWS("xml-write", false),
+    OX_XML_WRITE_ROWS("xml-write-dense", true),
+    {"csv-read",
+     "csv-read",
+     false,
+     kOxCsv,
+     false,
+     {ratio(nullptr, 1.0, 1.0, 1.0, ">= 1.0x getline+split")}},
+    {"csv-read", "csv-read", false, kGetline, true, {}},
+    {"csv-read-dense",
+     "csv-read",
+     true,
+     kOxCsv,
+     false,
+     {ratio(nullptr, 1.0, 1.0, 1.0, ">= 1.0x getline+split")}},
+    {"csv-read-dense", "csv-read", true, kGetline, true, {}},
+    {"csv-read-memory", "csv-read", false, kOxCsv, false, {memoryTimes(3.0, "<= 3x file size")}},
+    {"csv-read-memory", "csv-read", false, kGetline, true, {}},
+    {"csv-read-memory-dense",
+     "csv-read",
+     true,
+     kOxCsv,
+     false,
+     {memoryTimes(3.0, "<= 3x file size")}},
+    {"csv-read-memory-dense", "csv-read", true, kGetline, true, {}},
+    {"binary-file",
+     "binary-file",
+     false,
+     "OxBase OxInput::read(double&)",
+     false,
+     {ratio(nullptr, 0.8, 0.8, 0.8, ">= 0.8x ifstream")}},
+    {"binary-file", "binary-file", false, "ifstream::read 8 bytes + swap", true, {}},
+    {"binary-memory",
+     "binary-memory",
+     false,
+     "OxBase OxMemory::read(double&)",
+     false,
+     {ratio(nullptr, 0.5, 0.5, 0.5, ">= 0.5x fread")}},
+    {"binary-memory", "binary-memory", false, "fread 1 MiB blocks + swap", true, {}},
+    {"walk",
+     "walk",
+     false,
+     "OxBase OxFileTreeWalk, 10 slots",
+     false,
+     {ratio(nullptr, 0.8, 0.8, 0.8, ">= 0.8x nftw")}},
+    {"walk", "walk", false, "nftw FTW_PHYS", true, {}},
+    {"messages",
+     "messages",
+     false,
+     "OxBase OxMsg::Log by number",
+     false,
+     {ratio(nullptr, 0.8, 0.8, 0.8, ">= 0.8x ofstream")}},
+    {"messages", "messages", false, "ofstream, flush per line", true, {}},
+    {"range-walk",
+     "range-walk",
+     false,
+     "OxBase OxRangeList walk",
+     false,
+     {Target{Target::Under, nullptr, nullptr, 1.0, 1.0, 1.0, "< 1 s"}}},
+    {"range-walk", "range-walk", false, "vector of ranges, nested loop", true, {}},
 };
 
 struct Options {
     bool quick = false;
     bool keep = false;
-    bool coldHeap = false;
     int runs = 5;
     int timeoutSeconds = 180;
+    std::vector<Regime> regimes;
     std::vector<std::string> cases;
 };
 
-// What a child sends back through its pipe: plain data, one write.
-struct ChildReport {
-    int state = 0; // 0 ok, 1 prepare failed, 2 a run failed
-    int nbRuns = 0;
-    double times[64] = {};
+// What a child sends back through its pipe, plain data, one write each: once
+// when it is ready, then once per run.
+struct RunReport {
+    int state = 0; // 0 ok, 1 prepare failed, 2 the run failed
+    double seconds = 0.0;
     double amount = 0.0;
     double check = 0.0;
     int countsItems = 0;
@@ -123,6 +279,7 @@ struct ChildReport {
 
 struct RowResult {
     const RowSpec* plan = nullptr;
+    Regime regime = Regime::Default;
     std::string status; // "" when measured, else "not built", "timeout", ...
     double median = 0.0;
     double amount = 0.0;
@@ -150,74 +307,6 @@ long long currentRssBytes() {
 
 void copyText(char* target, std::size_t size, const std::string& text) {
     std::snprintf(target, size, "%s", text.c_str());
-}
-
-void copyNote(ChildReport& report, const std::string& note) {
-    copyText(report.note, sizeof(report.note), note);
-}
-
-// What afterRun freed is consolidated now, untimed, and not by the first
-// large allocation of the next run (a large request makes the allocator merge
-// its freed small chunks first). With --cold-heap the freed memory goes back
-// to the system instead, so that each run touches fresh pages as a new
-// process would.
-void releaseHeap(bool coldHeap) {
-    if (coldHeap) {
-        malloc_trim(0);
-    } else {
-        // volatile: a malloc and free of an unused block is otherwise elided.
-        void* volatile large = std::malloc(std::size_t(1) << 20);
-        std::free(large);
-    }
-}
-
-// Runs in the child: prepare, then either one measured run for the peak
-// memory, or a warm-up and `runs` timed runs.
-ChildReport childWork(const Entry& entry, const Corpus& corpus, int runs, bool memory,
-                      bool coldHeap) {
-    ChildReport report;
-    std::unique_ptr<Runner> runner = entry.factory();
-    std::string note;
-    if (!runner->prepare(corpus, note)) {
-        report.state = 1;
-        copyNote(report, note);
-        return report;
-    }
-    report.countsItems = runner->countsItems() ? 1 : 0;
-    if (memory) {
-        long long before = currentRssBytes();
-        Outcome outcome = runner->run();
-        struct rusage usage {};
-        getrusage(RUSAGE_SELF, &usage);
-        runner->afterRun(outcome);
-        report.peakBytes = std::max(0LL, static_cast<long long>(usage.ru_maxrss) * 1024 - before);
-        report.amount = outcome.amount;
-        report.check = outcome.check;
-        report.state = outcome.ok ? 0 : 2;
-        copyNote(report, outcome.note);
-        return report;
-    }
-    for (int i = -1; i < runs; i++) {
-        auto start = std::chrono::steady_clock::now();
-        Outcome outcome = runner->run();
-        auto stop = std::chrono::steady_clock::now();
-        runner->afterRun(outcome);
-        releaseHeap(coldHeap);
-        if (!outcome.ok) {
-            report.state = 2;
-            copyNote(report, outcome.note);
-            return report;
-        }
-        report.amount = outcome.amount;
-        report.check = outcome.check;
-        if (!outcome.note.empty()) {
-            copyNote(report, outcome.note);
-        }
-        if (i >= 0) {
-            report.times[report.nbRuns++] = std::chrono::duration<double>(stop - start).count();
-        }
-    }
-    return report;
 }
 
 bool writeAll(int fd, const void* data, std::size_t size) {
@@ -267,136 +356,98 @@ bool readAll(int fd, void* buffer, std::size_t size, int timeoutSeconds, bool& t
     return true;
 }
 
-RowResult runRow(const RowSpec& plan, const Corpus& corpus, const Options& options) {
-    RowResult result;
-    result.plan = &plan;
-    bool memory = std::strcmp(plan.caseName, "xml-read-memory") == 0;
-    const Entry* entry = findEntry(memory ? "xml-read" : plan.caseName, plan.impl);
-    if (entry == nullptr) {
-        result.status = "not built";
-        return result;
-    }
-    std::fflush(stdout);
-    std::fflush(stderr);
-    std::cout.flush();
-    std::cerr.flush();
-    int fds[2];
-    if (pipe(fds) != 0) {
-        result.status = "pipe failed";
-        return result;
-    }
-    pid_t pid = fork();
-    if (pid < 0) {
-        close(fds[0]);
-        close(fds[1]);
-        result.status = "fork failed";
-        return result;
-    }
-    if (pid == 0) {
-        close(fds[0]);
-        ChildReport report = childWork(*entry, corpus, options.runs, memory, options.coldHeap);
-        const char* data = reinterpret_cast<const char*>(&report);
-        std::size_t left = sizeof(report);
-        while (left > 0) {
-            ssize_t n = write(fds[1], data, left);
-            if (n <= 0) {
-                break;
-            }
-            data += n;
-            left -= static_cast<std::size_t>(n);
-        }
-        close(fds[1]);
-        _exit(0);
-    }
-    close(fds[1]);
-    ChildReport report;
-    bool timedOut = false;
-    bool complete = readAll(fds[0], &report, sizeof report, options.timeoutSeconds, timedOut);
-    close(fds[0]);
-    if (timedOut) {
-        kill(pid, SIGKILL);
-    }
-    int status = 0;
-    waitpid(pid, &status, 0);
-    if (timedOut) {
-        result.status = "timeout (> " + std::to_string(options.timeoutSeconds) + " s)";
-        return result;
-    }
-    if (!complete) {
-        result.status = WIFSIGNALED(status)
-                            ? "crashed (signal " + std::to_string(WTERMSIG(status)) + ")"
-                            : "no report";
-        return result;
-    }
-    result.note = report.note;
-    if (report.state == 1) {
-        result.status = "skipped";
-        return result;
-    }
-    if (report.state == 2) {
-        result.status = "failed";
-        return result;
-    }
-    result.amount = report.amount;
-    result.check = report.check;
-    result.countsItems = report.countsItems != 0;
-    result.peakBytes = report.peakBytes;
-    if (!memory) {
-        std::vector<double> times(report.times, report.times + report.nbRuns);
-        std::sort(times.begin(), times.end());
-        std::size_t n = times.size();
-        result.median = n % 2 == 1 ? times[n / 2] : (times[n / 2 - 1] + times[n / 2]) / 2.0;
-    }
-    return result;
+// ---- The child's side ---------------------------------------------------------
+
+// What afterRun freed is consolidated now, untimed, and not by the first
+// large allocation of the next run (a large request makes the allocator merge
+// its freed small chunks first).
+void consolidateHeap() {
+    // volatile: a malloc and free of an unused block is otherwise elided.
+    void* volatile large = std::malloc(std::size_t(1) << 20);
+    std::free(large);
 }
 
-// ---- Interleaved timing -------------------------------------------------
-//
-// The implementations of one case are timed in turns: each lives in its own
-// child process (prepared once), and the parent asks them for one run after
-// the other, round by round, the first of a round rotating. On a shared,
-// noisy machine every implementation of a case then sees the same load, and
-// the ratios stay meaningful.
-
-struct RunReport {
-    int state = 0; // 0 ok, 1 prepare failed, 2 the run failed
-    double seconds = 0.0;
-    double amount = 0.0;
-    double check = 0.0;
-    int countsItems = 0;
-    char note[512] = {};
-};
-
-// The child's side: prepare, report, then one run per 'r' until 'q'.
-[[noreturn]] void serveRuns(const Entry& entry, const Corpus& corpus, bool coldHeap, int cmdFd,
-                            int reportFd) {
+// Prepare, report ready, then one run per 'r' until 'q' or the end of the
+// pipe. In memory mode: one run, its peak resident memory, and the end.
+int serveRuns(const Entry& entry, const Corpus& corpus, bool memory, int cmdFd, int reportFd) {
     std::unique_ptr<Runner> runner = entry.factory();
     RunReport ready;
     std::string note;
     ready.state = runner->prepare(corpus, note) ? 0 : 1;
     ready.countsItems = runner->countsItems() ? 1 : 0;
     copyText(ready.note, sizeof(ready.note), note);
+    if (memory && ready.state == 0) {
+        if (!runner->beforeRun(note)) {
+            ready.state = 2;
+            copyText(ready.note, sizeof(ready.note), note);
+        } else {
+            long long before = currentRssBytes();
+            Outcome outcome = runner->run();
+            struct rusage usage {};
+            getrusage(RUSAGE_SELF, &usage);
+            runner->afterRun(outcome);
+            ready.peakBytes =
+                std::max(0LL, static_cast<long long>(usage.ru_maxrss) * 1024 - before);
+            ready.amount = outcome.amount;
+            ready.check = outcome.check;
+            ready.state = outcome.ok ? 0 : 2;
+            copyText(ready.note, sizeof(ready.note), outcome.note);
+        }
+    }
     writeAll(reportFd, &ready, sizeof(ready));
     char command = 0;
-    while (ready.state == 0 && read(cmdFd, &command, 1) == 1 && command == 'r') {
+    while (!memory && ready.state == 0 && read(cmdFd, &command, 1) == 1 && command == 'r') {
         RunReport report;
-        auto start = std::chrono::steady_clock::now();
-        Outcome outcome = runner->run();
-        auto stop = std::chrono::steady_clock::now();
-        runner->afterRun(outcome);
-        releaseHeap(coldHeap);
-        report.state = outcome.ok ? 0 : 2;
-        report.seconds = std::chrono::duration<double>(stop - start).count();
-        report.amount = outcome.amount;
-        report.check = outcome.check;
         report.countsItems = ready.countsItems;
-        copyText(report.note, sizeof(report.note), outcome.note);
+        std::string setup;
+        if (!runner->beforeRun(setup)) {
+            report.state = 2;
+            copyText(report.note, sizeof(report.note), setup);
+        } else {
+            auto start = std::chrono::steady_clock::now();
+            Outcome outcome = runner->run();
+            auto stop = std::chrono::steady_clock::now();
+            runner->afterRun(outcome);
+            consolidateHeap();
+            report.state = outcome.ok ? 0 : 2;
+            report.seconds = std::chrono::duration<double>(stop - start).count();
+            report.amount = outcome.amount;
+            report.check = outcome.check;
+            copyText(report.note, sizeof(report.note), outcome.note);
+        }
         if (!writeAll(reportFd, &report, sizeof(report))) {
             break;
         }
     }
-    _exit(0);
+    return 0;
 }
+
+// oxbench --child ENTRY-CASE IMPL DENSE QUICK CORPUS-DIR CMD-FD REPORT-FD MODE
+int childMain(int argc, char** argv) {
+    if (argc != 10) {
+        return 2;
+    }
+    const Entry* entry = findEntry(argv[2], argv[3]);
+    if (entry == nullptr) {
+        return 2;
+    }
+    Corpus corpus;
+    describeCorpus(corpus, argv[6], std::strcmp(argv[5], "1") == 0);
+    corpus.dense = std::strcmp(argv[4], "1") == 0;
+    int cmdFd = std::atoi(argv[7]);
+    int reportFd = std::atoi(argv[8]);
+    bool memory = std::strcmp(argv[9], "memory") == 0;
+    // The library's own messages (and the bench message) have their texts;
+    // each child logs to a file of its own below the corpus directory.
+    std::string log = "child-" + std::to_string(getpid()) + ".log";
+    OxMsg messages(corpus.messageFile.c_str(), nullptr, log.c_str(), corpus.logDir.c_str());
+    int result = serveRuns(*entry, corpus, memory, cmdFd, reportFd);
+    close(reportFd);
+    close(cmdFd);
+    return result;
+}
+
+// ---- The parent's side --------------------------------------------------------
 
 struct Worker {
     RowResult* result = nullptr;
@@ -406,6 +457,93 @@ struct Worker {
     std::vector<double> times;
     bool alive = false;
 };
+
+std::string g_exe;       // this program, for the children
+std::string g_corpusDir; // the corpus the children read
+
+// Starts the child of `plan` in `regime` (a fresh process of this program)
+// and waits until it is ready. On failure the result's status tells.
+Worker startWorker(RowResult* result, const Options& options, const std::vector<Worker>& others,
+                   bool memory) {
+    Worker w;
+    w.result = result;
+    const RowSpec& plan = *result->plan;
+    if (findEntry(plan.entryCase, plan.impl) == nullptr) {
+        result->status = "not built";
+        return w;
+    }
+    std::fflush(stdout);
+    std::fflush(stderr);
+    std::cout.flush();
+    std::cerr.flush();
+    int cmd[2], rep[2];
+    if (pipe(cmd) != 0) {
+        result->status = "pipe failed";
+        return w;
+    }
+    if (pipe(rep) != 0) {
+        close(cmd[0]);
+        close(cmd[1]);
+        result->status = "pipe failed";
+        return w;
+    }
+    // Everything the child needs is built before the fork: only async-signal
+    // safe calls run between fork and execve.
+    std::vector<std::string> args = {g_exe,
+                                     "--child",
+                                     plan.entryCase,
+                                     plan.impl,
+                                     plan.dense ? "1" : "0",
+                                     options.quick ? "1" : "0",
+                                     g_corpusDir,
+                                     std::to_string(cmd[0]),
+                                     std::to_string(rep[1]),
+                                     memory ? "memory" : "runs"};
+    std::vector<char*> argv;
+    for (std::string& a : args) {
+        argv.push_back(a.data());
+    }
+    argv.push_back(nullptr);
+    std::vector<std::string> envText;
+    for (char** e = environ; *e != nullptr; e++) {
+        if (std::strncmp(*e, "GLIBC_TUNABLES=", 15) != 0) {
+            envText.emplace_back(*e);
+        }
+    }
+    if (result->regime == Regime::Warm) {
+        envText.emplace_back(kWarmTunables);
+    }
+    std::vector<char*> envp;
+    for (std::string& e : envText) {
+        envp.push_back(e.data());
+    }
+    envp.push_back(nullptr);
+    pid_t pid = fork();
+    if (pid == 0) {
+        close(cmd[1]);
+        close(rep[0]);
+        for (const Worker& other : others) {
+            if (other.cmdFd >= 0) {
+                close(other.cmdFd);
+                close(other.reportFd);
+            }
+        }
+        execve(g_exe.c_str(), argv.data(), envp.data());
+        _exit(127);
+    }
+    close(cmd[0]);
+    close(rep[1]);
+    if (pid < 0) {
+        close(cmd[1]);
+        close(rep[0]);
+        result->status = "fork failed";
+        return w;
+    }
+    w.pid = pid;
+    w.cmdFd = cmd[1];
+    w.reportFd = rep[0];
+    return w;
+}
 
 void stopWorker(Worker& w, const std::string& status, bool timedOut) {
     if (w.pid > 0) {
@@ -436,112 +574,129 @@ std::string failureStatus(bool timedOut, int timeoutSeconds) {
     return timedOut ? "timeout (> " + std::to_string(timeoutSeconds) + " s)" : "no report";
 }
 
-// Times every implementation of one case in turns; fills `results`, which
-// holds one entry per row of the case, with `plan` set.
-void runCaseInterleaved(std::vector<RowResult*>& results, const Corpus& corpus,
-                        const Options& options) {
+// Waits for the child's ready report; a ready child is alive.
+void awaitReady(Worker& w, const Options& options, RunReport& ready) {
+    if (w.pid <= 0) {
+        return;
+    }
+    bool timedOut = false;
+    if (!readAll(w.reportFd, &ready, sizeof ready, options.timeoutSeconds, timedOut)) {
+        stopWorker(w, failureStatus(timedOut, options.timeoutSeconds), timedOut);
+    } else if (ready.state != 0) {
+        w.result->note = ready.note;
+        stopWorker(w, ready.state == 1 ? "skipped" : "failed", false);
+    } else {
+        w.alive = true;
+    }
+}
+
+// One read in a fresh process: its peak resident memory.
+void runMemoryRow(RowResult& result, const Options& options) {
+    std::vector<Worker> none;
+    Worker w = startWorker(&result, options, none, true);
+    RunReport ready;
+    awaitReady(w, options, ready);
+    if (w.alive) {
+        result.peakBytes = ready.peakBytes;
+        result.amount = ready.amount;
+        result.check = ready.check;
+        result.note = ready.note;
+        stopWorker(w, "", false);
+    }
+}
+
+// Asks a ready worker for one run and files its time.
+bool oneRun(Worker& w, const Options& options, bool keep) {
+    RunReport report;
+    bool timedOut = false;
+    if (!writeAll(w.cmdFd, "r", 1) ||
+        !readAll(w.reportFd, &report, sizeof report, options.timeoutSeconds, timedOut)) {
+        stopWorker(w, failureStatus(timedOut, options.timeoutSeconds), timedOut);
+        return false;
+    }
+    if (report.state != 0) {
+        w.result->note = report.note;
+        stopWorker(w, "failed", false);
+        return false;
+    }
+    if (report.note[0] != '\0') {
+        w.result->note = report.note;
+    }
+    w.result->amount = report.amount;
+    w.result->check = report.check;
+    w.result->countsItems = report.countsItems != 0;
+    if (keep) {
+        w.times.push_back(report.seconds);
+    }
+    return true;
+}
+
+double median(std::vector<double> times) {
+    if (times.empty()) {
+        return 0.0;
+    }
+    std::sort(times.begin(), times.end());
+    std::size_t n = times.size();
+    return n % 2 == 1 ? times[n / 2] : (times[n / 2 - 1] + times[n / 2]) / 2.0;
+}
+
+// ---- Interleaved timing -------------------------------------------------
+//
+// The implementations of one case are timed in turns, round by round, the
+// first of a round rotating, so that on a shared, noisy machine all of them
+// see the same load. Warm and default: each lives in one child (prepared
+// once), one warm-up round, then the timed rounds. Cold: every run is the
+// first and only run of a fresh child.
+void runCase(std::vector<RowResult*>& results, const Options& options, Regime regime) {
     std::vector<Worker> workers;
+    bool cold = regime == Regime::Cold;
     for (RowResult* r : results) {
         Worker w;
         w.result = r;
-        const Entry* entry = findEntry(r->plan->caseName, r->plan->impl);
-        if (entry == nullptr) {
+        if (!cold) {
+            w = startWorker(r, options, workers, false);
+            RunReport ready;
+            awaitReady(w, options, ready);
+        } else if (findEntry(r->plan->entryCase, r->plan->impl) == nullptr) {
             r->status = "not built";
-            workers.push_back(w);
-            continue;
-        }
-        std::fflush(stdout);
-        std::fflush(stderr);
-        std::cout.flush();
-        std::cerr.flush();
-        int cmd[2], rep[2];
-        if (pipe(cmd) != 0) {
-            r->status = "pipe failed";
-            workers.push_back(w);
-            continue;
-        }
-        if (pipe(rep) != 0) {
-            close(cmd[0]);
-            close(cmd[1]);
-            r->status = "pipe failed";
-            workers.push_back(w);
-            continue;
-        }
-        pid_t pid = fork();
-        if (pid == 0) {
-            close(cmd[1]);
-            close(rep[0]);
-            for (const Worker& other : workers) {
-                if (other.cmdFd >= 0) {
-                    close(other.cmdFd);
-                    close(other.reportFd);
-                }
-            }
-            serveRuns(*entry, corpus, options.coldHeap, cmd[0], rep[1]);
-        }
-        close(cmd[0]);
-        close(rep[1]);
-        if (pid < 0) {
-            close(cmd[1]);
-            close(rep[0]);
-            r->status = "fork failed";
-            workers.push_back(w);
-            continue;
-        }
-        w.pid = pid;
-        w.cmdFd = cmd[1];
-        w.reportFd = rep[0];
-        RunReport ready;
-        bool timedOut = false;
-        if (!readAll(w.reportFd, &ready, sizeof ready, options.timeoutSeconds, timedOut)) {
-            stopWorker(w, failureStatus(timedOut, options.timeoutSeconds), timedOut);
-        } else if (ready.state != 0) {
-            r->note = ready.note;
-            stopWorker(w, "skipped", false);
         } else {
-            w.alive = true;
+            w.alive = true; // started afresh for each run
         }
         workers.push_back(w);
     }
-    for (int round = -1; round < options.runs; round++) {
+    for (int round = cold ? 0 : -1; round < options.runs; round++) {
         std::size_t n = workers.size();
         for (std::size_t k = 0; k < n; k++) {
             Worker& w = workers[(k + static_cast<std::size_t>(round + 1)) % n];
             if (!w.alive) {
                 continue;
             }
-            RunReport report;
-            bool timedOut = false;
-            if (!writeAll(w.cmdFd, "r", 1) ||
-                !readAll(w.reportFd, &report, sizeof report, options.timeoutSeconds, timedOut)) {
-                stopWorker(w, failureStatus(timedOut, options.timeoutSeconds), timedOut);
+            if (!cold) {
+                oneRun(w, options, round >= 0);
                 continue;
             }
-            if (report.state != 0) {
-                w.result->note = report.note;
-                stopWorker(w, "failed", false);
+            std::vector<Worker> none;
+            Worker fresh = startWorker(w.result, options, none, false);
+            RunReport ready;
+            awaitReady(fresh, options, ready);
+            if (!fresh.alive) {
+                w.alive = false;
                 continue;
             }
-            if (report.note[0] != '\0') {
-                w.result->note = report.note;
-            }
-            w.result->amount = report.amount;
-            w.result->check = report.check;
-            w.result->countsItems = report.countsItems != 0;
-            if (round >= 0) {
-                w.times.push_back(report.seconds);
+            if (oneRun(fresh, options, true)) {
+                w.times.push_back(fresh.times.back());
+                stopWorker(fresh, "", false);
+            } else {
+                w.alive = false;
             }
         }
     }
     for (Worker& w : workers) {
         if (w.alive) {
-            std::vector<double> times = w.times;
-            std::sort(times.begin(), times.end());
-            std::size_t n = times.size();
-            w.result->median =
-                n == 0 ? 0.0
-                       : (n % 2 == 1 ? times[n / 2] : (times[n / 2 - 1] + times[n / 2]) / 2.0);
-            stopWorker(w, "", false);
+            w.result->median = median(w.times);
+            if (!cold) {
+                stopWorker(w, "", false);
+            }
         }
     }
 }
@@ -583,8 +738,8 @@ std::string cpuModel() {
 }
 
 void usage() {
-    std::cerr << "usage: oxbench [--quick] [--case NAME]... [--runs N] [--timeout SECONDS] "
-                 "[--keep] [--cold-heap] [--list]\n";
+    std::cerr << "usage: oxbench [--quick] [--case NAME]... [--regime warm|default|cold|all] "
+                 "[--runs N] [--timeout SECONDS] [--keep] [--list]\n";
 }
 
 bool wanted(const Options& options, const std::string& caseName) {
@@ -595,99 +750,134 @@ bool wanted(const Options& options, const std::string& caseName) {
         if (c == caseName) {
             return true;
         }
-        // The memory and comment rows belong to the XML read.
-        if (c == "xml-read" && caseName.rfind("xml-read", 0) == 0) {
+        // The dense, memory, destroy and comment rows go with their read.
+        if ((c == "xml-read" &&
+             (caseName.rfind("xml-read", 0) == 0 || caseName.rfind("xml-destroy", 0) == 0)) ||
+            (c == "csv-read" && caseName.rfind("csv-read", 0) == 0) ||
+            (c == "xml-write" && caseName.rfind("xml-write", 0) == 0)) {
             return true;
         }
     }
     return false;
 }
 
-// Compares one row with the reference of its case and with its target.
-void verdict(const RowResult& r, const std::vector<RowResult>& all, std::string& ratio,
-             std::string& target) {
-    const RowResult* ref = nullptr;
+const RowResult* findResult(const std::vector<RowResult>& all, const char* caseName,
+                            const char* impl, Regime regime) {
     for (const RowResult& o : all) {
-        if (std::strcmp(o.plan->caseName, r.plan->caseName) == 0 && o.plan->reference) {
-            ref = &o;
+        if (std::strcmp(o.plan->caseName, caseName) == 0 && o.regime == regime &&
+            (impl == nullptr ? o.plan->reference : std::strcmp(o.plan->impl, impl) == 0)) {
+            return &o;
         }
     }
-    bool memory = std::strcmp(r.plan->caseName, "xml-read-memory") == 0;
+    return nullptr;
+}
+
+// Judges one target of a row: "label (value): met" or "MISSED".
+std::string judge(const RowResult& r, const Target& t, const std::vector<RowResult>& all) {
     double value = 0.0;
-    bool haveRatio = false;
-    if (r.status.empty() && ref != nullptr && ref->status.empty()) {
-        if (memory && r.peakBytes > 0 && ref->peakBytes > 0) {
-            value = static_cast<double>(r.peakBytes) / static_cast<double>(ref->peakBytes);
-            ratio = fmt("%.2fx the memory", value);
-            haveRatio = true;
-        } else if (!memory && r.median > 0.0) {
-            value = ref->median / r.median;
-            ratio = r.plan->reference ? "1.00x (reference)" : fmt("%.2fx", value);
-            haveRatio = true;
-        }
-    }
-    target = r.plan->target;
-    if (target.empty() || !r.status.empty()) {
-        return;
-    }
-    std::string caseName = r.plan->caseName;
     bool met = false;
-    bool known = false;
-    if (caseName == "xml-read-memory") {
-        if (r.peakBytes >= 0 && r.amount > 0) {
-            met = static_cast<double>(r.peakBytes) <= 3.0 * r.amount;
-            known = true;
+    double need = t.need(r.regime);
+    std::string shown;
+    if (t.kind == Target::Memory) {
+        if (r.peakBytes < 0 || r.amount <= 0) {
+            return t.label;
         }
-    } else if (caseName == "xml-read-comment") {
-        for (const RowResult& o : all) {
-            if (std::strcmp(o.plan->caseName, "xml-read") == 0 &&
-                std::strcmp(o.plan->impl, r.plan->impl) == 0 && o.status.empty()) {
-                met = r.median <= 2.0 * o.median;
-                known = true;
-                target += fmt(" (%.2fx)", r.median / o.median);
-            }
+        value = static_cast<double>(r.peakBytes) / r.amount;
+        met = value <= need;
+        shown = fmt("%.2fx", value);
+    } else if (t.kind == Target::Under) {
+        met = r.median < need;
+        shown = timeText(r.median);
+    } else {
+        const RowResult* other = t.kind == Target::Fraction
+                                     ? findResult(all, t.otherCase, t.otherImpl, r.regime)
+                                     : findResult(all, r.plan->caseName, t.otherImpl, r.regime);
+        if (other == nullptr || !other->status.empty() || other->median <= 0.0 || r.median <= 0.0) {
+            return t.label;
         }
-    } else if (caseName == "range-walk") {
-        met = r.median < 1.0;
-        known = true;
-    } else if (haveRatio) {
-        double need = caseName == "xml-read" || caseName == "csv-read" ? 1.0
-                      : caseName == "xml-write"                        ? 0.9
-                      : caseName == "binary-memory"                    ? 0.5
-                                                                       : 0.8;
-        met = value >= need;
-        known = true;
+        if (t.kind == Target::Fraction) {
+            value = r.median / other->median;
+            met = value <= need;
+        } else {
+            value = other->median / r.median;
+            met = value >= need;
+        }
+        shown = fmt("%.2fx", value);
     }
-    if (known) {
-        target += met ? ": met" : ": MISSED";
+    std::string label = t.label;
+    if (t.kind == Target::Ratio && t.needWarm != t.needDefault) {
+        // The need of this regime, spelled out.
+        label = fmt(">= %.1fx ", need) + (t.otherImpl != nullptr ? t.otherImpl : "reference");
     }
+    return label + " (" + shown + "): " + (met ? "met" : "MISSED");
+}
+
+// The ratio to the case's reference in the same regime.
+std::string ratioText(const RowResult& r, const std::vector<RowResult>& all) {
+    const RowResult* ref = findResult(all, r.plan->caseName, nullptr, r.regime);
+    if (!r.status.empty() || ref == nullptr || !ref->status.empty()) {
+        return "";
+    }
+    if (r.plan->memory()) {
+        if (r.peakBytes > 0 && ref->peakBytes > 0) {
+            return fmt("%.2fx the memory",
+                       static_cast<double>(r.peakBytes) / static_cast<double>(ref->peakBytes));
+        }
+        return "";
+    }
+    if (r.median <= 0.0) {
+        return "";
+    }
+    return r.plan->reference ? "1.00x (reference)" : fmt("%.2fx", ref->median / r.median);
+}
+
+bool parseRegime(const std::string& text, std::vector<Regime>& regimes) {
+    if (text == "all") {
+        regimes = {Regime::Warm, Regime::Default, Regime::Cold};
+    } else if (text == "warm") {
+        regimes = {Regime::Warm};
+    } else if (text == "default") {
+        regimes = {Regime::Default};
+    } else if (text == "cold") {
+        regimes = {Regime::Cold};
+    } else {
+        return false;
+    }
+    return true;
+}
+
+std::string perMb(double count, std::uint64_t bytes) {
+    return fmt("%.0f", bytes > 0 ? count * 1e6 / static_cast<double>(bytes) : 0.0);
 }
 
 } // namespace
 
 int main(int argc, char** argv) {
+    if (argc > 1 && std::strcmp(argv[1], "--child") == 0) {
+        return childMain(argc, argv);
+    }
     Options options;
     for (int i = 1; i < argc; i++) {
         std::string arg = argv[i];
         if (arg == "--quick") {
             options.quick = true;
-        } else if (arg == "--cold-heap") {
-            options.coldHeap = true;
         } else if (arg == "--keep") {
             options.keep = true;
         } else if (arg == "--case" && i + 1 < argc) {
             options.cases.push_back(argv[++i]);
+        } else if (arg == "--regime" && i + 1 < argc) {
+            if (!parseRegime(argv[++i], options.regimes)) {
+                usage();
+                return 2;
+            }
         } else if (arg == "--runs" && i + 1 < argc) {
             options.runs = std::clamp(std::atoi(argv[++i]), 1, 64);
         } else if (arg == "--timeout" && i + 1 < argc) {
             options.timeoutSeconds = std::max(1, std::atoi(argv[++i]));
         } else if (arg == "--list") {
             for (const RowSpec& row : kRows) {
-                bool memory = std::strcmp(row.caseName, "xml-read-memory") == 0;
                 std::cout << row.caseName << "\t" << row.impl << "\t"
-                          << (findEntry(memory ? "xml-read" : row.caseName, row.impl) ? "built"
-                                                                                      : "not built")
-                          << "\n";
+                          << (findEntry(row.entryCase, row.impl) ? "built" : "not built") << "\n";
             }
             return 0;
         } else {
@@ -695,59 +885,79 @@ int main(int argc, char** argv) {
             return 2;
         }
     }
+    if (options.regimes.empty()) {
+        parseRegime("all", options.regimes);
+    }
+    // A child that ended (a memory row, a crash) must not end the parent
+    // that still writes to its pipe.
+    std::signal(SIGPIPE, SIG_IGN);
+    std::error_code ec;
+    g_exe = std::filesystem::canonical("/proc/self/exe", ec).string();
+    if (ec) {
+        std::cerr << "oxbench: cannot find its own program file\n";
+        return 1;
+    }
 
     Corpus corpus;
+    CorpusStats stats;
     std::string error;
     std::cerr << "oxbench: generating corpora" << (options.quick ? " (quick)" : "") << "...\n";
     auto genStart = std::chrono::steady_clock::now();
-    if (!generateCorpus(corpus, options.quick, error)) {
+    if (!generateCorpus(corpus, options.quick, stats, error)) {
         std::cerr << "oxbench: " << error << "\n";
         return 1;
     }
+    g_corpusDir = corpus.dir;
     std::cerr
         << "oxbench: corpora in " << corpus.dir << " ("
         << fmt("%.1f",
                std::chrono::duration<double>(std::chrono::steady_clock::now() - genStart).count())
         << " s)\n";
 
-    // One message subsystem for the whole run: the library's own messages and
-    // the bench message, logged to a file below the corpus directory.
-    OxMsg messages(corpus.messageFile.c_str(), nullptr, "oxbench.log", corpus.logDir.c_str());
-
-    // Rows of one case stand together in kRows. The memory rows run one by
-    // one (one read in a fresh child each); the others are timed in turns.
-    std::vector<RowResult> results;
-    results.reserve(sizeof(kRows) / sizeof(kRows[0]));
+    // Rows of one case stand together in kRows. Memory rows are measured
+    // once, one read in a fresh process each; the others once per regime.
     std::size_t count = sizeof(kRows) / sizeof(kRows[0]);
+    std::vector<RowResult> results;
+    results.reserve(count * options.regimes.size());
     for (std::size_t i = 0; i < count;) {
         std::size_t j = i;
         while (j < count && std::strcmp(kRows[j].caseName, kRows[i].caseName) == 0) {
             j++;
         }
         if (wanted(options, kRows[i].caseName)) {
-            std::cerr << "oxbench: " << kRows[i].caseName << "..." << std::flush;
-            std::vector<RowResult*> group;
-            for (std::size_t k = i; k < j; k++) {
-                if (std::strcmp(kRows[k].caseName, "xml-read-memory") == 0) {
-                    results.push_back(runRow(kRows[k], corpus, options));
-                } else {
+            bool memory = kRows[i].memory();
+            std::vector<Regime> regimes =
+                memory ? std::vector<Regime>{Regime::Fresh} : options.regimes;
+            for (Regime regime : regimes) {
+                std::cerr << "oxbench: " << kRows[i].caseName << " (" << regimeName(regime)
+                          << ")..." << std::flush;
+                std::size_t first = results.size();
+                for (std::size_t k = i; k < j; k++) {
                     RowResult r;
                     r.plan = &kRows[k];
+                    r.regime = regime;
                     results.push_back(r);
-                    group.push_back(&results.back());
                 }
+                if (memory) {
+                    for (std::size_t k = first; k < results.size(); k++) {
+                        runMemoryRow(results[k], options);
+                    }
+                } else {
+                    std::vector<RowResult*> group;
+                    for (std::size_t k = first; k < results.size(); k++) {
+                        group.push_back(&results[k]);
+                    }
+                    runCase(group, options, regime);
+                }
+                for (std::size_t k = first; k < results.size(); k++) {
+                    const RowResult& r = results[k];
+                    std::cerr << " "
+                              << (!r.status.empty()  ? r.status
+                                  : r.peakBytes >= 0 ? fmt("peak %.1f MB", r.peakBytes / 1e6)
+                                                     : timeText(r.median));
+                }
+                std::cerr << "\n";
             }
-            if (!group.empty()) {
-                runCaseInterleaved(group, corpus, options);
-            }
-            for (std::size_t k = results.size() - (j - i); k < results.size(); k++) {
-                const RowResult& r = results[k];
-                std::cerr << " "
-                          << (!r.status.empty()  ? r.status
-                              : r.peakBytes >= 0 ? fmt("peak %.1f MB", r.peakBytes / 1e6)
-                                                 : timeText(r.median));
-            }
-            std::cerr << "\n";
         }
         i = j;
     }
@@ -756,21 +966,40 @@ int main(int argc, char** argv) {
     std::time_t now = std::time(nullptr);
     std::strftime(date, sizeof(date), "%Y-%m-%d %H:%M UTC", std::gmtime(&now));
     std::cout << "oxbench " << (options.quick ? "--quick " : "") << "on " << cpuModel() << ", "
-              << sysconf(_SC_NPROCESSORS_ONLN) << " CPUs, " << date << "; median of "
-              << options.runs << " runs after one warm-up"
-              << (options.coldHeap ? ", heap returned to the system before each run" : "")
-              << ".\n\n";
+              << sysconf(_SC_NPROCESSORS_ONLN) << " CPUs, " << date << "; regimes";
+    for (Regime regime : options.regimes) {
+        std::cout << " " << regimeName(regime);
+    }
+    std::cout << "; median of " << options.runs
+              << " runs (warm, default: after one warm-up in one process; cold: one fresh "
+                 "process per run).\n\n";
+    std::uint64_t denseXml = fileSize(corpus.xmlDense);
+    std::uint64_t denseCsv = fileSize(corpus.csvDense);
     std::cout << "Corpora: XML model " << fmt("%.1f", fileSize(corpus.xmlModel) / 1e6)
-              << " MB, comment document " << fmt("%.1f", fileSize(corpus.xmlComment) / 1e6)
-              << " MB, CSV " << fmt("%.1f", fileSize(corpus.csvTable) / 1e6) << " MB, "
-              << corpus.nbDoubles << " doubles, tree of " << corpus.treeEntries << " entries, "
-              << corpus.nbMessages << " messages, range list of " << corpus.rangeRecords
-              << " records / " << corpus.rangeMembers << " members.\n\n";
-    std::cout << "| Case | Implementation | Median | Throughput | vs reference | Target |\n";
-    std::cout << "|---|---|---|---|---|---|\n";
+              << " MB, dense XML model " << fmt("%.1f", denseXml / 1e6) << " MB ("
+              << perMb(static_cast<double>(stats.elements), denseXml) << " elements and "
+              << perMb(static_cast<double>(stats.attributes), denseXml)
+              << " attributes per MB), comment document "
+              << fmt("%.1f", fileSize(corpus.xmlComment) / 1e6) << " MB, CSV "
+              << fmt("%.1f", fileSize(corpus.csvTable) / 1e6) << " MB, dense CSV "
+              << fmt("%.1f", denseCsv / 1e6) << " MB ("
+              << perMb(static_cast<double>(stats.records), denseCsv)
+              << " records of 10 fields per MB), " << corpus.nbDoubles << " doubles, tree of "
+              << corpus.treeEntries << " entries, " << corpus.nbMessages
+              << " messages, range list of " << corpus.rangeRecords << " records / "
+              << corpus.rangeMembers << " members.\n\n";
+    std::cout
+        << "| Case | Regime | Implementation | Median | Throughput | vs reference | Target |\n";
+    std::cout << "|---|---|---|---|---|---|---|\n";
     for (const RowResult& r : results) {
-        std::string ratio, target;
-        verdict(r, results, ratio, target);
+        std::string target;
+        if (r.status.empty()) {
+            for (const Target& t : r.plan->targets) {
+                if (t.kind != Target::None) {
+                    target += (target.empty() ? "" : "; ") + judge(r, t, results);
+                }
+            }
+        }
         std::string median, throughput;
         if (!r.status.empty()) {
             median = r.status;
@@ -785,22 +1014,20 @@ int main(int argc, char** argv) {
         }
         std::string note = r.note;
         // Implementations of one case must agree on what they read.
-        for (const RowResult& o : results) {
-            if (&o != &r && o.plan->reference && r.status.empty() && o.status.empty() &&
-                std::strcmp(o.plan->caseName, r.plan->caseName) == 0 && o.check != 0.0 &&
-                r.check != 0.0 && o.check != r.check) {
-                note += (note.empty() ? "" : "; ") + fmt("check %.17g", r.check) +
-                        fmt(" differs from reference %.17g", o.check);
-            }
+        const RowResult* ref = findResult(results, r.plan->caseName, nullptr, r.regime);
+        if (ref != nullptr && ref != &r && r.status.empty() && ref->status.empty() &&
+            ref->check != 0.0 && r.check != 0.0 && ref->check != r.check) {
+            note += (note.empty() ? "" : "; ") + fmt("check %.17g", r.check) +
+                    fmt(" differs from reference %.17g", ref->check);
         }
-        std::cout << "| " << r.plan->caseName << " | " << r.plan->impl << " | " << median << " | "
-                  << throughput << " | " << ratio << " | " << target
+        std::cout << "| " << r.plan->caseName << " | " << regimeName(r.regime) << " | "
+                  << r.plan->impl << " | " << median << " | " << throughput << " | "
+                  << ratioText(r, results) << " | " << target
                   << (note.empty() ? "" : " (" + note + ")") << " |\n";
     }
     std::cout.flush();
 
     if (!options.keep) {
-        std::error_code ec;
         std::filesystem::remove_all(corpus.dir, ec);
     } else {
         std::cerr << "oxbench: corpora kept in " << corpus.dir << "\n";

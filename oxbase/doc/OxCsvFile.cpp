@@ -7,6 +7,8 @@
 #include "oxbase/diag/OxPrt.h"
 #include "oxbase/doc/OxXmlAttribute.h"
 #include "oxbase/doc/OxXmlElement.h"
+#include "oxbase/doc/detail/OxCsvRecords.h"
+#include "oxbase/doc/detail/OxXmlStore.h"
 #include "oxbase/io/OxInput.h"
 #include "oxbase/io/OxOutput.h"
 
@@ -28,31 +30,6 @@ namespace {
 /// one byte of reserve.
 constexpr unsigned long long kMinLineBuffer = 1041;
 
-/// The name of a field behind the last column name: "column<position>".
-void generatedColumnName(char (&name)[24], unsigned int position) {
-    std::snprintf(name, sizeof name, "column%u", position);
-}
-
-/// Calls `take(start, length, last)` for each field of `line`, the empty ones
-/// included, `last` being true for the field that ends the line. The end of
-/// the text is tested before the separator, so every separator value is safe,
-/// NUL included (the whole line is then one field). `take` may write a NUL
-/// over the separator that ends its field.
-template <class Take> void splitFields(char* line, char separator, Take take) {
-    char* start = line;
-    for (char* p = line;; p++) {
-        bool last = *p == '\0';
-        if (!last && *p != separator) {
-            continue;
-        }
-        take(start, static_cast<size_t>(p - start), last);
-        if (last) {
-            return;
-        }
-        start = p + 1;
-    }
-}
-
 char const* nameOf(OxFile const* file) {
     char const* name = file != nullptr ? file->getFilename() : nullptr;
     return name != nullptr ? name : "";
@@ -72,7 +49,8 @@ OxCsvFile::OxCsvFile(char const* filename, OxFile::OxIOType type, char fieldSepa
 OxCsvFile::~OxCsvFile() {
     delete input;
     delete output;
-    delete root;
+    OxXmlElement::release(root);
+    delete store; // behind the nodes built there
     for (unsigned int i = 0; i < columnNames.getLength(); i++) {
         delete[] columnNames[i];
     }
@@ -119,7 +97,7 @@ void OxCsvFile::setRoot(OxXmlElement* newRoot) {
     if (newRoot == root) {
         return;
     }
-    delete root;
+    OxXmlElement::release(root);
     root = newRoot;
 }
 
@@ -152,16 +130,20 @@ OxBool OxCsvFile::readFile() {
     }
     unsigned int presetColumns = columnNames.getLength();
     bool read = withMemory([&] {
-        std::unique_ptr<char[]> line(new char[size]);
+        if (store == nullptr) {
+            store = new OxXmlStore;
+        }
         bool headerDone = presetColumns > 0;
-        setRoot(new OxXmlElement("root"));
+        setRoot(store->newElement("root", 4));
+        OxCsvRecords records(*store, *root, columnNames, separator);
+        std::unique_ptr<char[]> line(new char[size]);
         for (;;) {
             line[0] = '\0';
             OxBool more = input->getline(line.get(), static_cast<unsigned int>(size - 1), '\n');
             // A last line without a line end (or the part of a line that did
             // not fit) is still a line: take it before looking at why the
             // read ended.
-            takeLine(line.get(), headerDone);
+            takeLine(line.get(), headerDone, records);
             if (more != OxTrue) {
                 break;
             }
@@ -171,6 +153,8 @@ OxBool OxCsvFile::readFile() {
         // No part of a table: the records and the columns of this read go.
         reportNoMemory();
         setRoot(nullptr);
+        delete store; // no node is left in it
+        store = nullptr;
         while (columnNames.getLength() > presetColumns) {
             delete[] columnNames[--columnNames.length];
         }
@@ -183,7 +167,7 @@ OxBool OxCsvFile::readFile() {
     return OxTrue;
 }
 
-void OxCsvFile::takeLine(char* line, bool& headerDone) {
+void OxCsvFile::takeLine(char* line, bool& headerDone, OxCsvRecords& records) {
     OxString::stripWhite(line);
     if (line[0] == '\0' || isComment(line) == OxTrue) {
         return;
@@ -191,13 +175,13 @@ void OxCsvFile::takeLine(char* line, bool& headerDone) {
     if (!headerDone) {
         headerDone = takeHeader(line);
     } else {
-        takeRecord(line);
+        records.take(line);
     }
 }
 
 bool OxCsvFile::takeHeader(char* line) {
     bool complete = true;
-    splitFields(line, separator, [this, &complete](char* start, size_t length, bool last) {
+    splitCsvFields(line, separator, [this, &complete](char* start, size_t length, bool last) {
         if (last && length == 0) {
             // The line ends in the separator: more columns follow on the
             // next line that is not skipped.
@@ -207,37 +191,6 @@ bool OxCsvFile::takeHeader(char* line) {
         columnNames.append(OxString::dup(start, length));
     });
     return complete;
-}
-
-void OxCsvFile::takeRecord(char* line) {
-    std::unique_ptr<OxXmlElement> made(new OxXmlElement("record"));
-    root->addChild(made.get());
-    OxXmlElement* record = made.release(); // the root has it
-    record->setParent(root);
-    // One attribute per non-empty field: count them, so that the record's
-    // list is made once at its final size.
-    unsigned int fields = 0;
-    splitFields(line, separator,
-                [&fields](char*, size_t length, bool) { fields += length != 0 ? 1 : 0; });
-    record->reserveAttributes(fields);
-    unsigned int position = 0;
-    splitFields(line, separator, [this, record, &position](char* start, size_t length, bool) {
-        if (length != 0) {
-            start[length] = '\0';
-            char generated[24];
-            char const* name;
-            if (position < columnNames.getLength()) {
-                name = columnNames[position];
-            } else {
-                generatedColumnName(generated, position);
-                name = generated;
-            }
-            std::unique_ptr<OxXmlAttribute> attribute(new OxXmlAttribute(name));
-            record->addAttribute(attribute.get());
-            attribute.release()->setValue(start); // the record has it
-        }
-        position++;
-    });
 }
 
 // ---------------------------------------------------------------------------
@@ -387,7 +340,7 @@ OxBool OxCsvFile::parseCSVString(char const* text, char separator, OxGList<char*
         return OxTrue; // an empty text has no fields
     }
     OxString::stripWhite(copy);
-    splitFields(copy, separator, [&fields](char* start, size_t length, bool) {
+    splitCsvFields(copy, separator, [&fields](char* start, size_t length, bool) {
         if (length != 0) {
             char* field = OxString::dup(start, length);
             fields.append(OxString::stripWhite(field));

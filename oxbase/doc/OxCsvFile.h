@@ -37,6 +37,12 @@ class OxInput;
 class OxOutput;
 class OxXmlAttribute;
 class OxXmlElement;
+namespace oxbase {
+namespace detail {
+class OxCsvRecords;
+class OxXmlStore;
+} // namespace detail
+} // namespace oxbase
 
 class OxCsvFile {
 public:
@@ -124,14 +130,12 @@ public:
 private:
     /// Whether `line` begins with OX_CSV_COMMENT_START (OxFalse for null).
     OxBool isComment(char const* line);
-    /// Files one trimmed line that is neither blank nor a comment: header
+    /// Trims `line` and files it unless it is blank or a comment: header
     /// fields while the header is open, otherwise a record under `root`.
-    void takeLine(char* line, bool& headerDone);
+    void takeLine(char* line, bool& headerDone, oxbase::detail::OxCsvRecords& records);
     /// Appends the fields of a header line to the column names; returns
     /// whether the header is complete (the line does not end in the separator).
     bool takeHeader(char* line);
-    /// Creates a record under `root` from the fields of `line`.
-    void takeRecord(char* line);
     /// The lines of writeFile; std::bad_alloc reaches writeFile.
     void writeLines();
 
@@ -140,6 +144,9 @@ private:
     char separator;
     OxGList<char*> columnNames;
     OxXmlElement* root = nullptr;
+    /// Where the reader builds the records (doc/detail/OxXmlStore): made by
+    /// the first read, freed behind the tree.
+    oxbase::detail::OxXmlStore* store = nullptr;
 };
 
 #endif

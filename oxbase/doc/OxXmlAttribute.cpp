@@ -163,18 +163,34 @@ void OxXmlAttribute::operator delete(void* memory, std::nothrow_t const&) noexce
 
 OxXmlAttribute::~OxXmlAttribute() {
     OxXmlNames::release(name);
-    delete[] value;
+    if ((storage & kStoredValue) == 0) {
+        delete[] value;
+    }
+}
+
+void OxXmlAttribute::release(OxXmlAttribute* attribute) {
+    if (attribute == nullptr) {
+        return;
+    }
+    if ((attribute->storage & kStoredNode) != 0) {
+        attribute->~OxXmlAttribute(); // the memory goes with the store
+    } else {
+        delete attribute;
+    }
 }
 
 void OxXmlAttribute::setValue(char const* text) {
     char* copy = trimmedCopy(text); // first: without memory the value stays
-    delete[] value;
+    if ((storage & kStoredValue) == 0) {
+        delete[] value;
+    }
     value = copy;
+    storage &= static_cast<std::uint8_t>(~kStoredValue);
 }
 
 void OxXmlAttribute::storeFormatted() {
     char* text = OxString::stripWhite(conversionPrt.flushToString());
-    delete[] value;
+    delete[] value; // constructors only: never a stored value
     value = text;
 }
 

@@ -20,6 +20,12 @@
 
 class OxString;
 class OxPrt;
+class OxXmlElement;
+namespace oxbase {
+namespace detail {
+class OxXmlStore;
+} // namespace detail
+} // namespace oxbase
 class OxColor;
 class OxRot;
 class OxVec2d;
@@ -105,6 +111,15 @@ public:
 
 private:
     friend struct OxStatics;
+    friend class OxXmlElement;
+    friend class oxbase::detail::OxXmlStore;
+    /// Where the object and its value live: bits of `storage`. A stored
+    /// object was built by a document's store (OxXmlStore) and goes with it;
+    /// a stored value is a text in that store, replaced by a heap copy when
+    /// the value is set.
+    enum : std::uint8_t { kStoredNode = 1, kStoredValue = 2 };
+    /// Destroys `attribute` as its storage requires (null is ignored).
+    static void release(OxXmlAttribute* attribute);
     /// The scratch print object of the constructors that format a value
     /// (defined in oxbase/core/OxStatics.cpp).
     static OxPrt conversionPrt;
@@ -119,6 +134,7 @@ private:
     char const* name = nullptr; ///< shared with equal names (OxXmlNames)
     char* value = nullptr;
     OX_XML_ATTRIBUTE_DATA_TYPE type = OX_XML_ATTRIBUTE_TEXT;
+    std::uint8_t storage = 0;
 };
 
 #endif

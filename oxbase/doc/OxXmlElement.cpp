@@ -87,12 +87,16 @@ void OxXmlElement::operator delete(void* memory, std::nothrow_t const&) noexcept
 OxXmlElement::~OxXmlElement() {
     delete[] xsiType;
     OxXmlNames::release(name);
-    delete[] value;
+    if ((storage & kStoredValue) == 0) {
+        delete[] value;
+    }
     if (attributes != nullptr) {
         for (unsigned int i = 0; i < attributes->length; i++) {
-            delete attributes->data[i];
+            OxXmlAttribute::release(attributes->data[i]);
         }
-        deleteList(attributes);
+        if ((storage & kStoredAttributes) == 0) {
+            deleteList(attributes);
+        }
     }
     if (children == nullptr) {
         return;
@@ -119,14 +123,37 @@ OxXmlElement::~OxXmlElement() {
         if (element->children != nullptr) {
             takeChildren(element->children);
         }
+        release(element);
+    }
+}
+
+void OxXmlElement::release(OxXmlElement* element) {
+    if (element == nullptr) {
+        return;
+    }
+    if ((element->storage & kStoredNode) != 0) {
+        element->~OxXmlElement(); // the memory goes with the store
+    } else {
         delete element;
     }
+}
+
+void OxXmlElement::moveAttributesToHeap(unsigned int capacity) {
+    OxGList<OxXmlAttribute*>* list = newList<OxXmlAttribute*>(capacity);
+    for (unsigned int i = 0; i < attributes->length; i++) {
+        list->data[i] = attributes->data[i];
+    }
+    list->length = attributes->length;
+    attributes = list; // the stored list stays with the store
+    storage &= static_cast<std::uint8_t>(~kStoredAttributes);
 }
 
 void OxXmlElement::addAttribute(OxXmlAttribute* attribute) {
     if (attributes == nullptr) {
         // Most elements carry one or two attributes: start with one slot.
         attributes = newList<OxXmlAttribute*>(1);
+    } else if ((storage & kStoredAttributes) != 0) {
+        moveAttributesToHeap(attributes->length * 2 + 1);
     }
     attributes->append(attribute);
 }
@@ -134,6 +161,10 @@ void OxXmlElement::addAttribute(OxXmlAttribute* attribute) {
 void OxXmlElement::reserveAttributes(unsigned int count) {
     if (attributes == nullptr) {
         attributes = newList<OxXmlAttribute*>(count);
+    } else if ((storage & kStoredAttributes) != 0) {
+        if (count > attributes->length) {
+            moveAttributesToHeap(count);
+        }
     } else {
         attributes->reserve(count);
     }
@@ -155,7 +186,7 @@ OxBool OxXmlElement::deleteChild(unsigned int index) {
     }
     OxXmlElement* child = children->data[index];
     if (child != nullptr) {
-        delete child;
+        release(child);
         children->data[index] = nullptr;
     }
     return OxTrue;
@@ -168,7 +199,7 @@ OxBool OxXmlElement::deleteChildren(char const* childName) {
     for (unsigned int i = 0; i < children->length; i++) {
         OxXmlElement* child = children->data[i];
         if (child != nullptr && sameText(child->name, childName)) {
-            delete child;
+            release(child);
             children->data[i] = nullptr;
         }
     }
@@ -259,13 +290,19 @@ void OxXmlElement::setName(char const* newName) {
 
 void OxXmlElement::setValue(char const* newValue) {
     char* copy = trimmedCopy(newValue); // first: without memory the value stays
-    delete[] value;
+    if ((storage & kStoredValue) == 0) {
+        delete[] value;
+    }
     value = copy;
+    storage &= static_cast<std::uint8_t>(~kStoredValue);
 }
 
 void OxXmlElement::adoptValue(char* newValue) {
-    delete[] value;
+    if ((storage & kStoredValue) == 0) {
+        delete[] value;
+    }
     value = nullptr;
+    storage &= static_cast<std::uint8_t>(~kStoredValue);
     if (newValue == nullptr || *newValue == '\0') {
         delete[] newValue; // an empty text is no text, as with setValue
         return;

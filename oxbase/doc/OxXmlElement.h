@@ -23,6 +23,7 @@
 #include <new>
 
 class OxXmlFile;
+class OxCsvFile;
 
 class OxXmlElement {
 public:
@@ -136,6 +137,21 @@ public:
     virtual std::ostrstream* dump(std::ostrstream* stream) const;
 
 private:
+    friend class OxXmlFile;
+    friend class OxCsvFile;
+    friend class oxbase::detail::OxXmlStore;
+    /// Where the object and its parts live: bits of `storage`. A stored
+    /// element was built by a document's store (OxXmlStore) and goes with
+    /// it; a stored value is a text there, and a stored attribute list an
+    /// exact array there. Setters and addAttribute move what they change to
+    /// the heap, so callers see no difference.
+    enum : std::uint8_t { kStoredNode = 1, kStoredValue = 2, kStoredAttributes = 4 };
+    /// Destroys `element` and its subtree as their storage requires (null is
+    /// ignored): the way a document and a parent end the nodes they own.
+    static void release(OxXmlElement* element);
+    /// Gives the attribute list a heap array of `capacity` slots (at least
+    /// its length) instead of its stored one.
+    void moveAttributesToHeap(unsigned int capacity);
     /// Reads up to `count` numbers of attribute `attributeName` into `numbers`.
     /// 1: all found; 0: attribute or value missing; -1: too few or no copy.
     int readNumbers(char const* attributeName, double* numbers, unsigned int count) const;
@@ -143,6 +159,7 @@ private:
     void dumpNode(std::ostrstream& stream) const;
 
     XML_ELEMENT_TYPE type;
+    std::uint8_t storage = 0;
     char* xsiType = nullptr;
     char const* name = nullptr; ///< shared with equal names (OxXmlNames)
     char* value = nullptr;

@@ -5,6 +5,7 @@
 #include "oxbase/diag/OxMsg.h"
 #include "oxbase/diag/OxMsgNumbers.h"
 #include "oxbase/doc/detail/OxXmlReader.h"
+#include "oxbase/doc/detail/OxXmlStore.h"
 #include "oxbase/doc/detail/OxXmlTextBuffer.h"
 #include "oxbase/io/OxInput.h"
 #include "oxbase/io/OxOutput.h"
@@ -12,6 +13,7 @@
 #include <cctype>
 #include <cstring>
 #include <iostream>
+#include <memory>
 #include <new>
 
 using namespace oxbase::detail;
@@ -78,10 +80,10 @@ OxPrt& linePrt() {
 }
 
 /// One line of the writer, built in a buffer that every line reuses and
-/// handed to OxOutput::putline from there: a line costs no allocation and
-/// no copy but the output's own, where building it in a print stream and
-/// taking it out with flushToString cost a stream reset, a new array and a
-/// copy per line. The text is the same as that of the print stream.
+/// handed to the sink from there: a line costs no allocation and no copy but
+/// the output's own, where building it in a print stream and taking it out
+/// with flushToString cost a stream reset, a new array and a copy per line.
+/// The text is the same as that of the print stream.
 class LineBuffer {
 public:
     /// `text` right-aligned in a field of `width` characters.
@@ -105,11 +107,8 @@ public:
         }
         return true;
     }
-    /// Hands the line to `output` and starts the next.
-    void send(OxOutput& output) {
-        output.putline(text.text());
-        discard();
-    }
+    /// Hands the line to `sink` and starts the next.
+    void send(OxXmlLineSink& sink);
     /// Drops the line in progress.
     void discard() { text.clear(); }
 
@@ -119,9 +118,62 @@ private:
         return *this;
     }
 
-    oxbase::detail::OxXmlTextBuffer text;
+    OxXmlTextBuffer text;
 };
 } // namespace
+
+namespace oxbase {
+namespace detail {
+
+/// Where the writer's finished lines go. Flushing every line, each goes to
+/// OxOutput::putline (a write and a flush per line). Otherwise the lines are
+/// gathered, each with its line end, and handed to OxOutput::write in blocks
+/// of about 64 KiB, so that the stream is called once per block; finish
+/// hands over the rest. The bytes that reach the output are the same, and a
+/// failed block is reported by the output (message 179) and leaves it failed.
+class OxXmlLineSink {
+public:
+    OxXmlLineSink(OxOutput& out, bool flushEveryLine) : output(out), perLine(flushEveryLine) {
+        if (!perLine) {
+            pending.reserveFor(kBlock + kBlock / 4);
+        }
+    }
+    /// One line, `length` characters at `text` (NUL-terminated), without its
+    /// line end. Without memory std::bad_alloc, and the line is not taken.
+    void line(char const* text, size_t length) {
+        if (perLine) {
+            output.putline(text);
+            return;
+        }
+        pending.reserveFor(pending.size() + length + 1);
+        pending.append(text, length);
+        pending.append('\n');
+        if (pending.size() >= kBlock) {
+            finish();
+        }
+    }
+    /// Hands every gathered line to the output.
+    void finish() {
+        if (pending.size() > 0) {
+            output.write(pending.text(), static_cast<long long>(pending.size()));
+            pending.clear();
+        }
+    }
+
+private:
+    static constexpr size_t kBlock = 64 * 1024;
+    OxOutput& output;
+    bool perLine;
+    OxXmlTextBuffer pending;
+};
+
+} // namespace detail
+} // namespace oxbase
+
+void LineBuffer::send(OxXmlLineSink& sink) {
+    sink.line(text.text(), text.size());
+    discard();
+}
 
 // ---------------------------------------------------------------------------
 // The document
@@ -134,20 +186,21 @@ OxXmlFile::~OxXmlFile() {
     delete input;
     delete output;
     clearDocument();
+    delete store; // behind the nodes built there
 }
 
 void OxXmlFile::clearDocument() {
-    delete root;
+    OxXmlElement::release(root);
     root = nullptr;
-    delete declaration;
+    OxXmlElement::release(declaration);
     declaration = nullptr;
     doctype = nullptr; // a node of the lists or of the tree
     for (unsigned int i = 0; i < preRootNodes.length; i++) {
-        delete preRootNodes.data[i];
+        OxXmlElement::release(preRootNodes.data[i]);
     }
     preRootNodes.length = 0;
     for (unsigned int i = 0; i < postRootNodes.length; i++) {
-        delete postRootNodes.data[i];
+        OxXmlElement::release(postRootNodes.data[i]);
     }
     postRootNodes.length = 0;
 }
@@ -204,12 +257,18 @@ OxBool OxXmlFile::readFile() {
     }
     OxBool result = OxFalse;
     if (!withMemory([&] {
+            if (store == nullptr) {
+                store = new OxXmlStore;
+            }
             oxbase::detail::OxXmlReader reader(*this);
             result = reader.run();
         })) {
-        // No part of a document: what was read before the failure goes.
+        // No part of a document: what was read before the failure goes,
+        // and so does the store it was built in.
         reportNoMemory();
         clearDocument();
+        delete store;
+        store = nullptr;
         return OxFalse;
     }
     if (result && !input->isGood() && !input->eof()) {
@@ -252,12 +311,19 @@ OxBool OxXmlFile::writeFile() {
         return OxFalse;
     }
     OxBool result = OxFalse;
-    if (!withMemory([&] { result = writeDocument(); })) {
-        reportNoMemory(); // the lines sent so far stay in the file
+    std::unique_ptr<OxXmlLineSink> sink;
+    if (!withMemory([&] {
+            sink.reset(new OxXmlLineSink(*output, flushEveryLine != OxFalse));
+            result = writeDocument(*sink);
+        })) {
+        reportNoMemory(); // the lines finished so far still go to the file
         result = OxFalse;
     }
-    // A failed line does not stop the writer (putline reports it), but the
-    // stream stays failed, so the closing flush tells whether everything
+    if (sink != nullptr) {
+        sink->finish();
+    }
+    // A failed line does not stop the writer (the output reports it), but
+    // the stream stays failed, so the closing flush tells whether everything
     // reached the file: a document that did not is never reported written.
     if (output->flush() != OxTrue) {
         result = OxFalse;
@@ -266,10 +332,10 @@ OxBool OxXmlFile::writeFile() {
     return result;
 }
 
-OxBool OxXmlFile::writeDocument() {
+OxBool OxXmlFile::writeDocument(OxXmlLineSink& sink) {
     if (declaration != nullptr) {
         if (declaration->getValue() != nullptr) {
-            output->putline(declaration->getValue());
+            sink.line(declaration->getValue(), std::strlen(declaration->getValue()));
         }
     } else {
         // putline adds a second line end: an empty line follows.
@@ -290,30 +356,30 @@ OxBool OxXmlFile::writeDocument() {
             .add(OX_XML_QUOTE)
             .add(OX_XML_DECLARATION_END)
             .add('\n')
-            .send(*output);
+            .send(sink);
     }
     for (unsigned int i = 0; i < preRootNodes.length; i++) {
-        writeTopLevelNode(preRootNodes.data[i]);
+        writeTopLevelNode(preRootNodes.data[i], sink);
     }
-    OxBool result = root != nullptr ? write(root) : OxTrue;
+    OxBool result = root != nullptr ? write(root, sink) : OxTrue;
     for (unsigned int i = 0; i < postRootNodes.length; i++) {
-        writeTopLevelNode(postRootNodes.data[i]);
+        writeTopLevelNode(postRootNodes.data[i], sink);
     }
     return result;
 }
 
-void OxXmlFile::writeTopLevelNode(OxXmlElement const* node) {
+void OxXmlFile::writeTopLevelNode(OxXmlElement const* node, OxXmlLineSink& sink) {
     if (node == nullptr) {
         return;
     }
     if (node->getName() != nullptr) {
-        write(node); // a second top-level element kept by the reader
+        write(node, sink); // a second top-level element kept by the reader
     } else if (node->getValue() != nullptr) {
-        output->putline(node->getValue());
+        sink.line(node->getValue(), std::strlen(node->getValue()));
     }
 }
 
-OxBool OxXmlFile::write(OxXmlElement const* element) {
+OxBool OxXmlFile::write(OxXmlElement const* element, OxXmlLineSink& sink) {
     // Depth-first with an explicit stack, so that any depth is safe. The
     // lines and the indentation steps are those of the natural recursion:
     // up by one behind a start tag with children (dropped beyond 20), down by
@@ -327,7 +393,7 @@ OxBool OxXmlFile::write(OxXmlElement const* element) {
     OxGList<Frame> stack;
     LineBuffer line;
     enum Visit { Done, Opened, Failed };
-    auto visit = [this, &stack, &line](OxXmlElement const* node) -> Visit {
+    auto visit = [&stack, &line, &sink](OxXmlElement const* node) -> Visit {
         if (node == nullptr) {
             return Done;
         }
@@ -335,7 +401,8 @@ OxBool OxXmlFile::write(OxXmlElement const* element) {
             if (node->getValue() == nullptr) {
                 return Failed;
             }
-            output->putline(node->getValue()); // raw nodes stand at the margin
+            // Raw nodes stand at the margin.
+            sink.line(node->getValue(), std::strlen(node->getValue()));
             return Done;
         }
         line.field(curpos + 1, OX_XML_START).add(node->getName());
@@ -346,7 +413,7 @@ OxBool OxXmlFile::write(OxXmlElement const* element) {
                 .add(OX_XML_NODE_END)
                 .add(node->getName())
                 .add(OX_XML_END);
-            line.send(*output);
+            line.send(sink);
             return Done;
         }
         for (unsigned int i = 0; i < node->getNbAttributes(); i++) {
@@ -358,11 +425,11 @@ OxBool OxXmlFile::write(OxXmlElement const* element) {
         }
         if (node->getNbChildElements() == 0) {
             line.add(OX_XML_NODE_END).add(OX_XML_END);
-            line.send(*output);
+            line.send(sink);
             return Done;
         }
         line.add(OX_XML_END);
-        line.send(*output);
+        line.send(sink);
         adjustIndent(1);
         stack.append(Frame{node, 0});
         return Opened;
@@ -384,7 +451,7 @@ OxBool OxXmlFile::write(OxXmlElement const* element) {
             .add(OX_XML_NODE_END)
             .add(top.element->getName())
             .add(OX_XML_END);
-        line.send(*output);
+        line.send(sink);
         stack.length--;
     }
     return OxTrue;

@@ -26,6 +26,8 @@ class OxOutput;
 namespace oxbase {
 namespace detail {
 class OxXmlReader;
+class OxXmlLineSink;
+class OxXmlStore;
 } // namespace detail
 } // namespace oxbase
 
@@ -115,6 +117,13 @@ public:
     /// at the end, so a document that did not reach the file whole is never
     /// answered OxTrue.
     OxBool writeFile();
+    /// Whether writeFile flushes the output at every line (OxTrue, the
+    /// default: each line is in the file as soon as it is written) or hands
+    /// the lines over in large blocks and flushes once at the end (OxFalse:
+    /// the same bytes, much faster). A failed write is reported alike in
+    /// both modes: the output's message 179 and writeFile answering OxFalse.
+    void setFlushEveryLine(OxBool flush) { flushEveryLine = flush != OxFalse ? OxTrue : OxFalse; }
+    OxBool getFlushEveryLine() const { return flushEveryLine; }
 
     static short getIndent() { return curpos; }
     /// Moves the indentation to `position`; values outside 0..20 change nothing.
@@ -136,12 +145,12 @@ private:
     OxBool isDoctype(char const* text);
     OxBool isCdata(char const* text);
     /// Writes one element and its subtree (without recursion).
-    OxBool write(OxXmlElement const* element);
+    OxBool write(OxXmlElement const* element, oxbase::detail::OxXmlLineSink& sink);
     /// Writes a node of the lists before and behind the root.
-    void writeTopLevelNode(OxXmlElement const* node);
+    void writeTopLevelNode(OxXmlElement const* node, oxbase::detail::OxXmlLineSink& sink);
     /// The lines of writeFile, from the declaration to the last node behind
-    /// the root; std::bad_alloc reaches writeFile.
-    OxBool writeDocument();
+    /// the root, handed to `sink`; std::bad_alloc reaches writeFile.
+    OxBool writeDocument(oxbase::detail::OxXmlLineSink& sink);
     /// Deletes the tree, the declaration and the nodes beside the root.
     void clearDocument();
     static void moveIndent(short to);
@@ -154,6 +163,10 @@ private:
     OxGList<OxXmlElement*> preRootNodes;
     OxGList<OxXmlElement*> postRootNodes;
     OxPrt prt;
+    OxBool flushEveryLine = OxTrue;
+    /// Where the reader builds the nodes (doc/detail/OxXmlStore): made by the
+    /// first read, freed behind the tree.
+    oxbase::detail::OxXmlStore* store = nullptr;
 };
 
 #endif

@@ -169,32 +169,35 @@ TEST(AllocFailure, XmlReadGivesTheWholeDocumentOrNone) {
 }
 
 TEST(AllocFailure, XmlWriteAnswersFalseAndKeepsWhatWasSent) {
-    oxtest::TempDir dir;
-    oxtest::writeFile(dir.file("a.xml"), kDocument);
-    OxXmlFile whole(dir.file("a.xml").c_str(), OxFile::OxIOInput);
-    ASSERT_EQ(whole.readFile(), OxTrue);
-    whole.open(dir.file("whole.xml").c_str(), OxFile::OxIOOutput);
-    ASSERT_EQ(whole.writeFile(), OxTrue);
-    std::string complete = oxtest::readFile(dir.file("whole.xml"));
-    untilItRunsThrough([&](long long n) {
-        OxBool result = OxFalse;
-        bool reached = false;
-        testing::internal::CaptureStderr();
-        {
-            OxXmlFile file(dir.file("a.xml").c_str(), OxFile::OxIOInput);
-            file.readFile();
-            file.open(dir.file("out.xml").c_str(), OxFile::OxIOOutput);
-            Armed armed(n);
-            result = file.writeFile();
-            reached = Armed::reached();
-        }
-        std::string reports = testing::internal::GetCapturedStderr();
-        std::string written = oxtest::readFile(dir.file("out.xml"));
-        EXPECT_EQ(result, reached ? OxFalse : OxTrue) << n;
-        EXPECT_EQ(reports, reached ? kFatal : "") << n;
-        EXPECT_EQ(complete.compare(0, written.size(), written), 0) << n; // a start of it
-        return reached;
-    });
+    for (OxBool flushEveryLine : {OxTrue, OxFalse}) {
+        oxtest::TempDir dir;
+        oxtest::writeFile(dir.file("a.xml"), kDocument);
+        OxXmlFile whole(dir.file("a.xml").c_str(), OxFile::OxIOInput);
+        ASSERT_EQ(whole.readFile(), OxTrue);
+        whole.open(dir.file("whole.xml").c_str(), OxFile::OxIOOutput);
+        ASSERT_EQ(whole.writeFile(), OxTrue);
+        std::string complete = oxtest::readFile(dir.file("whole.xml"));
+        untilItRunsThrough([&](long long n) {
+            OxBool result = OxFalse;
+            bool reached = false;
+            testing::internal::CaptureStderr();
+            {
+                OxXmlFile file(dir.file("a.xml").c_str(), OxFile::OxIOInput);
+                file.readFile();
+                file.open(dir.file("out.xml").c_str(), OxFile::OxIOOutput);
+                file.setFlushEveryLine(flushEveryLine);
+                Armed armed(n);
+                result = file.writeFile();
+                reached = Armed::reached();
+            }
+            std::string reports = testing::internal::GetCapturedStderr();
+            std::string written = oxtest::readFile(dir.file("out.xml"));
+            EXPECT_EQ(result, reached ? OxFalse : OxTrue) << n;
+            EXPECT_EQ(reports, reached ? kFatal : "") << n;
+            EXPECT_EQ(complete.compare(0, written.size(), written), 0) << n; // a start of it
+            return reached;
+        });
+    }
 }
 
 TEST(AllocFailure, CsvReadGivesTheWholeTableOrNone) {

@@ -416,3 +416,65 @@ TEST_F(OxXmlFileTest, MillionLevelsDeep) {
     EXPECT_EQ(written.substr(written.size() - 10), "</a>\n</a>\n");
     file.reset(); // destroyed without recursion
 }
+
+TEST_F(OxXmlFileTest, UnflushedWriteGivesTheSameBytes) {
+    // A document of several 64 KiB blocks: raw nodes before, inside and
+    // behind the root, values, attributes, list values over several lines.
+    std::string text = std::string(kDecl) + "<!-- before -->\n<model a=\"1\">\n";
+    for (int i = 0; i < 3000; i++) {
+        text += " <part id=\"" + std::to_string(i) + "\" list=\"1 2 3 4 5 6 7 8 9 10 11\n 12\">\n";
+        text += "  <label>part " + std::to_string(i) + "</label>\n  <!-- inside\n two -->\n";
+        text += "  <empty/>\n </part>\n";
+    }
+    text += "</model>\n<!-- behind -->\n";
+    auto file = read(text, OxTrue);
+    EXPECT_EQ(file->getFlushEveryLine(), OxTrue); // the default
+    std::string flushed = write(*file, OxTrue);
+    ASSERT_GT(flushed.size(), 3u * 65536);
+    file->setFlushEveryLine(OxFalse);
+    EXPECT_EQ(file->getFlushEveryLine(), OxFalse);
+    messages.take();
+    EXPECT_EQ(write(*file, OxTrue), flushed);
+    EXPECT_EQ(messages.take(), Messages{"written " + messages.dir.file("out.xml")});
+
+    // A generated declaration keeps its empty line; a failed node leaves the
+    // same lines in both modes.
+    auto empty = read("", OxTrue);
+    empty->setFlushEveryLine(OxFalse);
+    EXPECT_EQ(write(*empty, OxTrue), "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n\n");
+    file->getRootForUpdate()->getChild(1)->addChild(new OxXmlElement(nullptr));
+    std::string failedUnflushed = write(*file, OxFalse);
+    OxXmlFile::setIndent(0);
+    file->setFlushEveryLine(OxTrue);
+    EXPECT_EQ(write(*file, OxFalse), failedUnflushed);
+    OxXmlFile::setIndent(0);
+    const std::string behind = "\n<!-- behind -->\n";
+    EXPECT_EQ(
+        failedUnflushed.compare(failedUnflushed.size() - behind.size(), behind.size(), behind), 0);
+
+    // A file that cannot take the whole document: message 179 and OxFalse,
+    // and what reached the file is the document's start.
+    if (!oxtest::canFork()) {
+        return;
+    }
+    file = read(text, OxTrue);
+    std::string whole = write(*file, OxTrue);
+    std::string path = messages.dir.file("limited.xml");
+    messages.take();
+    std::string result = oxtest::inChild(
+        [&] {
+            file->open(path.c_str(), OxFile::OxIOOutput);
+            file->setFlushEveryLine(OxFalse);
+            std::string report = file->writeFile() == OxTrue ? "written" : "failed";
+            for (const std::string& message : messages.take()) {
+                report += "|" + message.substr(0, message.find(' '));
+            }
+            return report;
+        },
+        {false, 100000});
+    EXPECT_EQ(result.rfind("failed|write|", 0), 0u) << result;
+    EXPECT_NE(result.find("|written"), std::string::npos) << result;
+    std::string limited = oxtest::readFile(path);
+    EXPECT_EQ(limited.size(), 100000u);
+    EXPECT_EQ(whole.compare(0, limited.size(), limited), 0);
+}

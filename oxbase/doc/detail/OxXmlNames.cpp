@@ -41,11 +41,6 @@ std::size_t hashOf(char const* text, std::size_t length) {
     return static_cast<std::size_t>(hash);
 }
 
-/// The white space that OxString::stripWhite trims.
-bool isWhite(char c) {
-    return std::isspace(static_cast<unsigned char>(c)) != 0;
-}
-
 void placeEntry(NameEntry** slots, std::size_t capacity, NameEntry* entry) {
     std::size_t mask = capacity - 1;
     std::size_t slot = entry->hash & mask;
@@ -73,13 +68,20 @@ void resize(std::size_t capacity) {
 } // namespace
 
 char const* OxXmlNames::acquire(char const* text) {
-    if (text == nullptr || *text == '\0') {
+    if (text == nullptr) {
         return nullptr;
     }
-    while (isWhite(*text)) {
-        text++;
+    return acquire(text, std::strlen(text));
+}
+
+char const* OxXmlNames::acquire(char const* text, std::size_t length) {
+    if (text == nullptr || length == 0) {
+        return nullptr;
     }
-    std::size_t length = std::strlen(text);
+    while (length > 0 && isWhite(*text)) {
+        text++;
+        length--;
+    }
     while (length > 0 && isWhite(text[length - 1])) {
         length--;
     }
@@ -106,6 +108,14 @@ char const* OxXmlNames::acquire(char const* text) {
     placeEntry(table.slots, table.capacity, entry);
     table.used++;
     return entry->text();
+}
+
+char const* OxXmlNames::share(char const* name) {
+    if (name != nullptr) {
+        auto* entry = reinterpret_cast<NameEntry*>(const_cast<char*>(name) - sizeof(NameEntry));
+        entry->users++;
+    }
+    return name;
 }
 
 void OxXmlNames::release(char const* name) {

@@ -15,6 +15,7 @@
 #ifndef OXBASE_DOC_DETAIL_OXXMLNAMES_H
 #define OXBASE_DOC_DETAIL_OXXMLNAMES_H
 
+#include <cctype>
 #include <cstddef>
 
 namespace oxbase {
@@ -25,11 +26,25 @@ public:
     /// The shared, trimmed text of `text`: null for a null or empty text, an
     /// empty text for one of white space alone. Each call counts one user.
     static char const* acquire(char const* text);
+    /// The same for the `length` characters at `text` (no terminator needed).
+    static char const* acquire(char const* text, std::size_t length);
+    /// One user more of a text returned by acquire (null is ignored); returns
+    /// it. For a caller that names many nodes alike.
+    static char const* share(char const* name);
     /// One user less of a text returned by acquire (null is ignored); the
     /// text is freed with its last user.
     static void release(char const* name);
     /// Distinct texts in use (for tests and statistics).
     static std::size_t count();
+    /// Whether OxString::stripWhite trims `c` (std::isspace), without the
+    /// library call for the ASCII characters, whose class no locale changes.
+    static bool isWhite(char c) {
+        auto code = static_cast<unsigned char>(c);
+        if (code < 0x80) {
+            return code == ' ' || (code >= '\t' && code <= '\r');
+        }
+        return std::isspace(code) != 0;
+    }
 };
 
 } // namespace detail

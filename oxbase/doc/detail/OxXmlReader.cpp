@@ -1,10 +1,12 @@
 #include "oxbase/doc/detail/OxXmlReader.h"
 
 #include "oxbase/core/OxString.h"
+#include "oxbase/core/detail/OxNoMemory.h"
 #include "oxbase/diag/OxMsg.h"
 #include "oxbase/diag/OxMsgNumbers.h"
 #include "oxbase/doc/OxXmlAttribute.h"
 #include "oxbase/doc/OxXmlElement.h"
+#include "oxbase/doc/detail/OxXmlNames.h"
 #include "oxbase/io/OxInput.h"
 
 #include <cctype>
@@ -14,6 +16,44 @@
 
 namespace oxbase {
 namespace detail {
+
+OxXmlReader::NameCache::~NameCache() {
+    for (Entry& entry : slots) {
+        delete[] entry.raw;
+        OxXmlNames::release(entry.shared);
+    }
+}
+
+char const* OxXmlReader::NameCache::lookup(char const* text, size_t length) {
+    if (length == 0) {
+        return nullptr;
+    }
+    size_t slot = (length * 31 + static_cast<unsigned char>(text[0]) +
+                   static_cast<unsigned char>(text[length - 1]) * 7) %
+                  kSlots;
+    Entry& entry = slots[slot];
+    if (entry.raw != nullptr && entry.length == length &&
+        std::memcmp(entry.raw, text, length) == 0) {
+        return entry.shared;
+    }
+    // A new name: its shared text and a copy of the raw text first, so that
+    // the entry is replaced only when both are there.
+    std::unique_ptr<char[]> raw(new char[length]);
+    std::memcpy(raw.get(), text, length);
+    char const* shared = OxXmlNames::acquire(text, length);
+    delete[] entry.raw;
+    OxXmlNames::release(entry.shared);
+    entry.raw = raw.release();
+    entry.length = length;
+    entry.shared = shared;
+    return shared;
+}
+
+OxXmlReader::~OxXmlReader() {
+    for (unsigned int i = 0; i < tagAttributes.length; i++) {
+        OxXmlStore::discard(tagAttributes.data[i]);
+    }
+}
 
 OxBool OxXmlReader::run() {
     source.start(file.input->getFileLength());
@@ -46,10 +86,10 @@ OxBool OxXmlReader::run() {
         }
         char* begin = line;
         char* end = line + length;
-        while (begin < end && std::isspace(static_cast<unsigned char>(*begin))) {
+        while (begin < end && OxXmlNames::isWhite(*begin)) {
             begin++;
         }
-        while (end > begin && std::isspace(static_cast<unsigned char>(end[-1]))) {
+        while (end > begin && OxXmlNames::isWhite(end[-1])) {
             end--;
         }
         if (begin == end) {
@@ -126,20 +166,23 @@ int OxXmlReader::doContent() {
         return kGoOn;
     }
     cursor = open;
-    if (file.isDeclaration(cursor)) {
-        return OxMsgXmlInnerDeclaration;
-    }
-    if (file.isComment(cursor)) {
-        state = COMMENT;
-        return kGoOn;
-    }
-    if (file.isDoctype(cursor)) {
-        state = DOCTYPE;
-        return kGoOn;
-    }
-    if (file.isCdata(cursor)) {
-        state = CDATA;
-        return kGoOn;
+    // Every marker begins "<?" or "<!": a tag needs none of the comparisons.
+    if (open[1] == '?' || open[1] == '!') {
+        if (file.isDeclaration(cursor)) {
+            return OxMsgXmlInnerDeclaration;
+        }
+        if (file.isComment(cursor)) {
+            state = COMMENT;
+            return kGoOn;
+        }
+        if (file.isDoctype(cursor)) {
+            state = DOCTYPE;
+            return kGoOn;
+        }
+        if (file.isCdata(cursor)) {
+            state = CDATA;
+            return kGoOn;
+        }
     }
     char* nameBegin = cursor + 1;
     while (nameBegin < lineEnd && *nameBegin == ' ') {
@@ -185,7 +228,7 @@ int OxXmlReader::doElementValue() {
     char* open = find(cursor, '<');
     char* valueEnd = open != nullptr ? open : lineEnd;
     if (current != nullptr) {
-        withText(cursor, valueEnd, [this](char const* text) { current->setValue(text); });
+        store.setValue(current, cursor, static_cast<size_t>(valueEnd - cursor));
     }
     cursor = valueEnd;
     if (open == nullptr || open[1] != '/') {
@@ -215,6 +258,7 @@ int OxXmlReader::doAttribute() {
         if (cursor[1] != '>') {
             return OxMsgXmlBadTagEnd;
         }
+        commitAttributes();
         if (current != nullptr) {
             current = current->getParent();
         }
@@ -224,16 +268,23 @@ int OxXmlReader::doAttribute() {
     case '=':
         attribute = nullptr;
         if (current != nullptr) {
-            std::unique_ptr<OxXmlAttribute> made;
-            withText(nameBegin, nameEnd,
-                     [&made](char const* text) { made.reset(new OxXmlAttribute(text)); });
-            current->addAttribute(made.get());
-            attribute = made.release(); // the element has it; its value comes next
+            if (tagElement != current) {
+                commitAttributes();
+                tagElement = current;
+            }
+            OxXmlAttribute* made = store.newAttributeShared(
+                names.lookup(nameBegin, static_cast<size_t>(nameEnd - nameBegin)));
+            if (!withMemory([&] { tagAttributes.append(made); })) {
+                OxXmlStore::discard(made);
+                throw std::bad_alloc();
+            }
+            attribute = made; // its element gets it at the tag's end; its value comes next
         }
         cursor++;
         state = ATTRIBUTE_VALUE;
         return kGoOn;
     case '>':
+        commitAttributes();
         cursor++;
         state = ELEMENT_VALUE;
         return kGoOn;
@@ -254,7 +305,7 @@ int OxXmlReader::doAttributeValue() {
     char* close = find(cursor, quote);
     if (close != nullptr) {
         if (attribute != nullptr) {
-            withText(cursor, close, [this](char const* text) { attribute->setValue(text); });
+            store.setValue(attribute, cursor, static_cast<size_t>(close - cursor));
         }
         cursor = close + 1;
         state = ATTRIBUTE;
@@ -291,7 +342,7 @@ int OxXmlReader::doAttributeValueMore() {
     }
     gathered.append(cursor, static_cast<size_t>(close - cursor));
     if (attribute != nullptr) {
-        attribute->setValue(gathered.text());
+        store.setValue(attribute, gathered.text(), gathered.size());
     }
     gathered.clear();
     cursor = close + 1;
@@ -357,22 +408,28 @@ int OxXmlReader::doDoctype() {
 }
 
 void OxXmlReader::createElement(char* tagStart, char* nameBegin, char* nameEnd, bool makeCurrent) {
-    std::unique_ptr<OxXmlElement> made;
-    withText(nameBegin, nameEnd, [&made](char const* text) { made.reset(new OxXmlElement(text)); });
-    OxXmlElement* element = nullptr;
-    if (file.root == nullptr) {
-        element = file.root = made.release();
-    } else if (current != nullptr) {
-        current->addChild(made.get());
-        element = made.release(); // the parent has it
-        element->setParent(current);
-    } else {
-        // A second element at top level has no parent to go to: it is kept
-        // behind the root, where the writer writes it back.
-        OxMsg::Log(OxMsgXmlSecondTopLevel, fileName(), lineNumber, offsetOf(tagStart),
-                   nameOrEmpty(made->getName()));
-        file.postRootNodes.append(made.get());
-        element = made.release(); // the list has it
+    commitAttributes();
+    OxXmlElement* element =
+        store.newElementShared(names.lookup(nameBegin, static_cast<size_t>(nameEnd - nameBegin)));
+    // Until a place in the document has it, the element is destroyed when
+    // memory runs out.
+    bool placed = withMemory([&] {
+        if (file.root == nullptr) {
+            file.root = element;
+        } else if (current != nullptr) {
+            current->addChild(element);
+            element->setParent(current);
+        } else {
+            // A second element at top level has no parent to go to: it is
+            // kept behind the root, where the writer writes it back.
+            OxMsg::Log(OxMsgXmlSecondTopLevel, fileName(), lineNumber, offsetOf(tagStart),
+                       nameOrEmpty(element->getName()));
+            file.postRootNodes.append(element);
+        }
+    });
+    if (!placed) {
+        OxXmlStore::discard(element);
+        throw std::bad_alloc();
     }
     if (makeCurrent) {
         current = element;
@@ -412,6 +469,14 @@ void OxXmlReader::attach(OxXmlElement* node) {
     }
 }
 
+void OxXmlReader::commitAttributes() {
+    if (tagAttributes.length > 0 && tagElement != nullptr) {
+        store.addAttributes(tagElement, tagAttributes.data, tagAttributes.length);
+    }
+    tagAttributes.length = 0;
+    tagElement = nullptr;
+}
+
 void OxXmlReader::finishComment(bool cdata) {
     int kind = cdata ? 1 : 0;
     if (commentNode[kind] != nullptr) {
@@ -429,6 +494,10 @@ void OxXmlReader::finishComment(bool cdata) {
 
 void OxXmlReader::finish() {
     // What stands open at the end keeps what was gathered.
+    if (gathering && gatheredValid && attribute != nullptr) {
+        store.setValue(attribute, gathered.text(), gathered.size());
+    }
+    commitAttributes();
     if (commentOpen[0]) {
         finishComment(false);
     }
@@ -437,9 +506,6 @@ void OxXmlReader::finish() {
     }
     if (doctypeLoaded && file.doctype != nullptr) {
         file.doctype->setValue(doctypeText.text());
-    }
-    if (gathering && gatheredValid && attribute != nullptr) {
-        attribute->setValue(gathered.text());
     }
 }
 

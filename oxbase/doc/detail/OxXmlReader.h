@@ -7,6 +7,7 @@
 
 #include "oxbase/doc/OxXmlFile.h"
 #include "oxbase/doc/detail/OxXmlLineSource.h"
+#include "oxbase/doc/detail/OxXmlStore.h"
 #include "oxbase/doc/detail/OxXmlTextBuffer.h"
 
 #include <cstddef>
@@ -39,10 +40,40 @@ namespace detail {
 /// keep their bytes. Texts gathered over many lines grow in place and are
 /// stored once, so the work stays linear in the size of the input.
 class OxXmlReader {
+    /// The names of a document repeat: the raw text of a tag or attribute
+    /// name is looked up here first, and the shared text (OxXmlNames) only
+    /// when the name is new to the cache. Each entry holds one use of its
+    /// name; the cache gives them back at its end.
+    class NameCache {
+    public:
+        NameCache() = default;
+        NameCache(const NameCache&) = delete;
+        NameCache& operator=(const NameCache&) = delete;
+        ~NameCache();
+        /// The shared text of the `length` raw characters at `text`, as
+        /// OxXmlNames::acquire makes it; the cache keeps the use.
+        char const* lookup(char const* text, size_t length);
+
+    private:
+        struct Entry {
+            char const* raw = nullptr; ///< the raw text, a copy owned here
+            size_t length = 0;
+            char const* shared = nullptr;
+        };
+        static constexpr size_t kSlots = 64;
+        Entry slots[kSlots];
+    };
+
 public:
-    explicit OxXmlReader(OxXmlFile& document) : file(document), source(*document.input) {}
+    /// Reads into `document`, whose store must exist: elements, attributes
+    /// and their values are built there.
+    explicit OxXmlReader(OxXmlFile& document)
+        : file(document), store(*document.store), source(*document.input) {}
     OxXmlReader(const OxXmlReader&) = delete;
     OxXmlReader& operator=(const OxXmlReader&) = delete;
+    /// Attributes not yet handed to their element (a read left by
+    /// std::bad_alloc) are destroyed.
+    ~OxXmlReader();
 
     OxBool run();
 
@@ -94,12 +125,16 @@ private:
     void createElement(char* tagStart, char* nameBegin, char* nameEnd, bool makeCurrent);
     void closeByEndTag(char* tagStart, char* nameBegin);
     void attach(OxXmlElement* node);
+    /// Hands the attributes of the tag in progress to their element.
+    void commitAttributes();
     void finishComment(bool cdata);
     void finish();
     static char const* nameOrEmpty(char const* text) { return text != nullptr ? text : ""; }
     char const* fileName() const { return nameOrEmpty(file.input->getFilename()); }
 
     OxXmlFile& file;
+    OxXmlStore& store;
+    NameCache names;
     OxXmlLineSource source;
     State state = START;
     unsigned int lineNumber = 0;
@@ -115,6 +150,10 @@ private:
     // The DOCTYPE text: gathered over the whole read, stored at its end.
     bool doctypeLoaded = false;
     OxXmlTextBuffer doctypeText;
+    // The attributes of the tag in progress, handed to their element at the
+    // tag's end as one exact list.
+    OxXmlElement* tagElement = nullptr;
+    OxGList<OxXmlAttribute*> tagAttributes;
     // The attribute in progress and its value gathered over several lines.
     OxXmlAttribute* attribute = nullptr;
     char quote = '"';

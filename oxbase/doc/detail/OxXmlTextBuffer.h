@@ -42,6 +42,11 @@ public:
     void append(char c) { append(&c, 1); }
     /// The text, NUL-terminated; "" while nothing was appended.
     char const* text() const { return data != nullptr ? data : ""; }
+    /// Characters in the text.
+    size_t size() const { return length; }
+    /// Makes room for `count` characters in all; without memory std::bad_alloc
+    /// and the text is unchanged.
+    void reserveFor(size_t count) { reserve(count + 1); }
     /// Tells the buffer that its text will not grow beyond `maxLength`
     /// characters (what is left of the input bounds a gathered text).
     void expectAtMost(size_t maxLength) { ceiling = maxLength + 1; }
