@@ -22,6 +22,8 @@
 #ifndef OXBASE_IO_OXFILETREEWALK_H
 #define OXBASE_IO_OXFILETREEWALK_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/io/OxInodeTable.h"
 #include "oxbase/platform/OxStat.h"
 
@@ -48,7 +50,7 @@ enum OxFileTreeWalkType {
 typedef int (*OxFileTreeWalkCallback)(const char* path, const OxStat* status,
                                       OxFileTreeWalkType type, void* userData);
 
-class OxFileTreeWalk {
+class OXBASE_API OxFileTreeWalk {
 public:
     /// One directory being read: its stream, or the names read ahead when the
     /// stream was parked (each ended by a zero byte, the whole by one more).

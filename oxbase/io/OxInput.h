@@ -16,16 +16,18 @@
 #ifndef OXBASE_IO_OXINPUT_H
 #define OXBASE_IO_OXINPUT_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/io/OxFile.h"
 
 #include <fstream>
 
 /// `value` with its 8 bytes in reverse order (a bit-pattern operation).
-double swapd(double value);
+OXBASE_API double swapd(double value);
 /// `value` with its 4 bytes in reverse order (a bit-pattern operation).
-float swapf(float value);
+OXBASE_API float swapf(float value);
 
-class OxInput : public OxFile {
+class OXBASE_API OxInput : public OxFile {
 public:
     /// Opens `name` for input (binary mode for FILE_MODE_BINARY, text mode
     /// otherwise) and measures its length. On failure logs 1 and the state;
