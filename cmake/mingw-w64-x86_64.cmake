@@ -9,8 +9,8 @@
 # the system's DLLs (msvcrt.dll, kernel32.dll) is needed to run them.
 #
 # Wine: CTest starts every test program through CMAKE_CROSSCOMPILING_EMULATOR,
-# the wine64 loader with WINEDEBUG=-all and a throwaway prefix inside the
-# build directory (OXBASE_WINEPREFIX), made on first use (about 10 seconds).
+# cmake/wine-run: the wine64 loader with WINEDEBUG=-all and a throwaway
+# prefix inside the build directory (OXBASE_WINEPREFIX), made on first use.
 set(CMAKE_SYSTEM_NAME Windows)
 set(CMAKE_SYSTEM_PROCESSOR x86_64)
 
@@ -31,13 +31,13 @@ set(CMAKE_FIND_ROOT_PATH_MODE_PACKAGE ONLY)
 set(CMAKE_EXE_LINKER_FLAGS_INIT "-static-libgcc -static-libstdc++ -static")
 set(CMAKE_SHARED_LINKER_FLAGS_INIT "-static-libgcc -static-libstdc++ -static")
 
-# Wine runs the programs that the build makes (tests, test discovery).
-# Debian's wine64 package installs its loader below /usr/lib/wine; the wine
-# package adds the `wine` command.
+# Wine runs the programs that the build makes (tests, test discovery),
+# through cmake/wine-run. Debian's wine64 package installs its loader below
+# /usr/lib/wine; the wine package adds the `wine` command.
 find_program(OXBASE_WINE NAMES wine64 wine PATHS /usr/lib/wine NO_CMAKE_FIND_ROOT_PATH)
 if(OXBASE_WINE)
     set(OXBASE_WINEPREFIX "${CMAKE_BINARY_DIR}/wineprefix" CACHE PATH
         "Throwaway Wine prefix in which the test programs run")
     set(CMAKE_CROSSCOMPILING_EMULATOR
-        "${CMAKE_COMMAND};-E;env;WINEDEBUG=-all;WINEPREFIX=${OXBASE_WINEPREFIX};${OXBASE_WINE}")
+        "/bin/sh;${CMAKE_CURRENT_LIST_DIR}/wine-run;${OXBASE_WINE};${OXBASE_WINEPREFIX}")
 endif()

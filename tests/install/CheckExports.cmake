@@ -17,12 +17,27 @@ foreach(var NM LIBRARY FORMAT)
 endforeach()
 
 if(FORMAT STREQUAL "elf")
-    set(options -D --defined-only --demangle)
+    execute_process(COMMAND "${NM}" -D --defined-only --demangle "${LIBRARY}"
+        RESULT_VARIABLE result OUTPUT_VARIABLE listing ERROR_VARIABLE errors)
 else()
-    set(options --defined-only --demangle)
+    # Every export has its __imp_ pointer in the import library (data has
+    # nothing else); those names, without the prefix, demangled by c++filt.
+    execute_process(COMMAND "${NM}" --defined-only "${LIBRARY}"
+        RESULT_VARIABLE result OUTPUT_VARIABLE raw ERROR_VARIABLE errors)
+    string(REGEX MATCHALL "__imp_[^\n]+" imports "${raw}")
+    list(TRANSFORM imports REPLACE "^__imp_" "")
+    list(REMOVE_DUPLICATES imports)
+    list(JOIN imports "\n" mangled)
+    get_filename_component(work "${LIBRARY}" DIRECTORY)
+    file(WRITE "${work}/exports.mangled" "${mangled}\n")
+    find_program(CXXFILT NAMES c++filt REQUIRED)
+    execute_process(COMMAND "${CXXFILT}" INPUT_FILE "${work}/exports.mangled"
+        OUTPUT_VARIABLE demangled)
+    string(REPLACE "std::basic_ostream<char, std::char_traits<char> >" "std::ostream"
+        demangled "${demangled}")
+    # The same layout as nm's lines: address, type letter, name.
+    string(REGEX REPLACE "([^\n]+)" "0 I \\1" listing "${demangled}")
 endif()
-execute_process(COMMAND "${NM}" ${options} "${LIBRARY}"
-    RESULT_VARIABLE result OUTPUT_VARIABLE listing ERROR_VARIABLE errors)
 if(NOT result EQUAL 0)
     message(FATAL_ERROR "CheckExports: ${NM} failed on ${LIBRARY} (${result}): ${errors}")
 endif()
