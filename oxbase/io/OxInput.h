@@ -54,6 +54,14 @@ public:
     /// fails (2 and the state; bytes that arrived stay in `buffer`).
     long long read(char* buffer, unsigned int length);
     long long read(unsigned char* buffer, unsigned int length);
+    /// Up to `length` characters as the stream delivers them, for readers of
+    /// text that read in blocks: in text mode on Windows each CR LF of the
+    /// file arrives as one "\n", so a text file gives fewer characters than
+    /// its length. Fewer than `length` only at the end of the file, which
+    /// sets the end-of-file flag and is no failure: the count is returned,
+    /// nothing is logged. A state that is not clean before the call, a read
+    /// error or a null `buffer` give 0 with 2 and the state logged.
+    long long readText(char* buffer, unsigned int length);
 
     /// Reads `count` 16-bit units and stores the low 7 bits of each second
     /// byte; `stored` counts the characters. Returns 2 * count. No terminator.
