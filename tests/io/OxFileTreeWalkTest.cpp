@@ -116,7 +116,9 @@ int indexOf(const std::vector<Visit>& visits, const std::string& path) {
 #ifdef _WIN32
 /// Open handles that name a directory below `root` (or `root` itself),
 /// without the one of the working directory, which Windows holds open.
-/// Handles are small multiples of 4: each is asked for its path.
+/// Handles are small multiples of 4: each of the first 1,024 is asked for
+/// its path. -1 when the working directory's handle is not among them, so
+/// that a count that missed handles cannot pass.
 int openDirectoriesBelow(const std::string& root) {
     auto lower = [](std::string text) {
         for (char& c : text) {
@@ -128,7 +130,7 @@ int openDirectoriesBelow(const std::string& root) {
     const std::string current = lower("\\\\?\\" + cwd());
     int count = 0;
     bool workingDirectorySeen = false;
-    for (std::uintptr_t value = 4; value < 65536; value += 4) {
+    for (std::uintptr_t value = 4; value <= 4096; value += 4) {
         char path[4096];
         DWORD length = GetFinalPathNameByHandleA(reinterpret_cast<HANDLE>(value), path, sizeof path,
                                                  FILE_NAME_NORMALIZED);
@@ -144,7 +146,7 @@ int openDirectoriesBelow(const std::string& root) {
             count++;
         }
     }
-    return count;
+    return workingDirectorySeen ? count : -1;
 }
 #else
 /// Open descriptors that name a directory below `root`.
