@@ -17,6 +17,8 @@
 #ifndef OXBASE_CORE_HASHTABLE_H
 #define OXBASE_CORE_HASHTABLE_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/core/OxString.h"
 #include "oxbase/core/OxTypes.h"
 
@@ -32,7 +34,7 @@ struct HashEntry {
     unsigned int ref = 0;
 };
 
-class HashTable {
+class OXBASE_API HashTable {
 public:
     /// A table with no slots: init (or assignment from an initialised table)
     /// must run before any other operation. The constructor is constexpr so

@@ -10,6 +10,8 @@
 #ifndef OXBASE_CORE_OXGLIST_H
 #define OXBASE_CORE_OXGLIST_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/core/OxTypes.h"
 
 #include <new>
@@ -19,7 +21,7 @@
 namespace oxbase {
 namespace detail {
 /// Writes the out-of-range report of an element access to standard output.
-void reportListRange(unsigned int index, unsigned int length);
+OXBASE_API void reportListRange(unsigned int index, unsigned int length);
 } // namespace detail
 } // namespace oxbase
 

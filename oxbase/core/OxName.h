@@ -13,6 +13,8 @@
 #ifndef OXBASE_CORE_OXNAME_H
 #define OXBASE_CORE_OXNAME_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/core/HashTable.h"
 #include "oxbase/core/OxString.h"
 #include "oxbase/core/OxTypes.h"
@@ -21,7 +23,7 @@
 
 class OxNameTableGuard;
 
-class OxName {
+class OXBASE_API OxName {
 public:
     /// The character "_".
     static char const underline;

@@ -13,6 +13,8 @@
 #ifndef OXBASE_CORE_OXSTRING_H
 #define OXBASE_CORE_OXSTRING_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/core/OxTypes.h"
 
 #include <cstddef>
@@ -20,7 +22,7 @@
 
 class OxPrt;
 
-class OxString {
+class OXBASE_API OxString {
 public:
     static char const* const str_empty;   ///< "<empty>"
     static char const* const str_none;    ///< "<none>"

@@ -12,13 +12,15 @@
 #ifndef OXBASE_CORE_OXSYSTEM_H
 #define OXBASE_CORE_OXSYSTEM_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/core/OxTypes.h"
 #include "oxbase/platform/OxCompiler.h"
 
 #include <cstddef>
 #include <ctime>
 
-class OxSystem {
+class OXBASE_API OxSystem {
 public:
     /// The platform a process runs on, as getOS reports it.
     enum OxOperatingSystem : std::int32_t { OxOSUnknown = 0, OxOSWindows = 7, OxOSLinux = 8 };

@@ -9,11 +9,13 @@
 #ifndef OXBASE_CORE_OXTYPE_H
 #define OXBASE_CORE_OXTYPE_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/core/OxTypes.h"
 
 #include <cstdint>
 
-class OxType {
+class OXBASE_API OxType {
 public:
     /// Identifier of the CAD system of an object. Stored as a signed 32-bit
     /// number; applications may use values of their own beyond these.

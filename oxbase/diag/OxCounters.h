@@ -12,11 +12,13 @@
 #ifndef OXBASE_DIAG_OXCOUNTERS_H
 #define OXBASE_DIAG_OXCOUNTERS_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/core/OxGList.h"
 #include "oxbase/core/OxTypes.h"
 
 /// A named count, 0 at construction.
-class OxCounter {
+class OXBASE_API OxCounter {
 public:
     /// Stores a copy of `name`; null for a null or empty name.
     explicit OxCounter(const char* name);
@@ -48,7 +50,7 @@ private:
 
 /// A set of counters that owns them. Elements may be read as a list; a null
 /// element or one without name is passed over by every lookup.
-class OxCounters : public OxGList<OxCounter*> {
+class OXBASE_API OxCounters : public OxGList<OxCounter*> {
 public:
     OxCounters() = default;
     OxCounters(const OxCounters&) = delete;

@@ -13,11 +13,13 @@
 #ifndef OXBASE_DIAG_OXFLAVOR_H
 #define OXBASE_DIAG_OXFLAVOR_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/core/OxGList.h"
 #include "oxbase/core/OxTypes.h"
 
 /// One flavor that exists: a name and an id.
-class OxFlavorEntry {
+class OXBASE_API OxFlavorEntry {
 public:
     /// Stores a copy of `name` (null for a null or empty name) and `id`; a
     /// null `name` leaves the id 0 as well.
@@ -41,7 +43,7 @@ private:
 
 /// The flavors that exist and the ones that are active. Not copyable: the
 /// object owns its entries.
-class OxFlavor {
+class OXBASE_API OxFlavor {
 public:
     /// Copies each entry of `flavors` (name and id), in order; a null element
     /// stays a null entry that no name finds. The caller's list and entries

@@ -24,6 +24,8 @@
 #ifndef OXBASE_DIAG_OXHEAPINFO_H
 #define OXBASE_DIAG_OXHEAPINFO_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/core/OxTypes.h"
 #include "oxbase/platform/OxHeapWalk.h"
 
@@ -31,7 +33,7 @@
 
 class OxPrt;
 
-class OxHeapInfo {
+class OXBASE_API OxHeapInfo {
 public:
     /// One block of a picture.
     struct HeapEntry {

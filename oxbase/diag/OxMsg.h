@@ -13,6 +13,8 @@
 #ifndef OXBASE_DIAG_OXMSG_H
 #define OXBASE_DIAG_OXMSG_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/core/OxGList.h"
 #include "oxbase/core/OxTypes.h"
 
@@ -43,7 +45,7 @@ struct OxMsgRecord_s {
     char* text = nullptr;                  ///< the printf format, a new array
 };
 
-class OxMsg {
+class OXBASE_API OxMsg {
 public:
     using Callback = void (*)(const char* text, void* userData);
 

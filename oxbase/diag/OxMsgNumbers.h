@@ -12,6 +12,8 @@
 #ifndef OXBASE_DIAG_OXMSGNUMBERS_H
 #define OXBASE_DIAG_OXMSGNUMBERS_H
 
+#include "oxbase/platform/OxExport.h"
+
 enum OxMsgNumber : unsigned int {
     OxMsgFileOpen = 1,            ///< file name: the file cannot be opened
     OxMsgFileRead = 2,            ///< file name: a read fails
@@ -54,11 +56,11 @@ enum OxMsgNumber : unsigned int {
 
 /// The numbers the library logs, ascending: index 0, 1, ... gives each in
 /// turn, and 0 once the index is past the last.
-unsigned int OxMsgLibraryNumber(unsigned int index);
+OXBASE_API unsigned int OxMsgLibraryNumber(unsigned int index);
 
 /// The kinds of the arguments the library passes with `number`, in order
 /// ("s" text, "u" unsigned number, "" none), or null for a number the
 /// library does not log. Where call sites differ (180), the shortest list.
-const char* OxMsgLibraryArguments(unsigned int number);
+OXBASE_API const char* OxMsgLibraryArguments(unsigned int number);
 
 #endif

@@ -12,12 +12,14 @@
 #ifndef OXBASE_DIAG_OXPRT_H
 #define OXBASE_DIAG_OXPRT_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/core/OxTypes.h"
 #include "oxbase/platform/OxStrstream.h"
 
 #include <cstddef>
 
-class OxPrt {
+class OXBASE_API OxPrt {
 public:
     using Callback = void (*)(const char* text, void* userData);
 
@@ -85,9 +87,9 @@ private:
 };
 
 /// Does nothing: the statics of OxPrt are set up when the library is loaded.
-void OxPrtInit();
+OXBASE_API void OxPrtInit();
 
 /// Writes the indentation of a dump line: curpos + 1 blanks.
-std::ostrstream& oxIndent(std::ostrstream& stream);
+OXBASE_API std::ostrstream& oxIndent(std::ostrstream& stream);
 
 #endif

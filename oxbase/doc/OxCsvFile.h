@@ -28,6 +28,8 @@
 #ifndef OXBASE_DOC_OXCSVFILE_H
 #define OXBASE_DOC_OXCSVFILE_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/core/OxGList.h"
 #include "oxbase/core/OxTypes.h"
 #include "oxbase/io/OxFile.h"
@@ -44,7 +46,7 @@ class OxXmlStore;
 } // namespace detail
 } // namespace oxbase
 
-class OxCsvFile {
+class OXBASE_API OxCsvFile {
 public:
     /// The first character of a comment line: "#".
     static char const OX_CSV_COMMENT_START;

@@ -11,6 +11,8 @@
 #ifndef OXBASE_DOC_OXXMLATTRIBUTE_H
 #define OXBASE_DOC_OXXMLATTRIBUTE_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/core/OxGList.h"
 #include "oxbase/core/OxTypes.h"
 
@@ -32,7 +34,7 @@ class OxVec2d;
 class OxVec3d;
 class OxVec4d;
 
-class OxXmlAttribute {
+class OXBASE_API OxXmlAttribute {
 public:
     /// How the value is held; text is the one kind in use.
     enum OX_XML_ATTRIBUTE_DATA_TYPE : std::int32_t { OX_XML_ATTRIBUTE_TEXT = 0 };

@@ -14,6 +14,8 @@
 #ifndef OXBASE_DOC_OXXMLELEMENT_H
 #define OXBASE_DOC_OXXMLELEMENT_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/core/OxGList.h"
 #include "oxbase/core/OxTypes.h"
 #include "oxbase/doc/OxXmlAttribute.h"
@@ -25,7 +27,7 @@
 class OxXmlFile;
 class OxCsvFile;
 
-class OxXmlElement {
+class OXBASE_API OxXmlElement {
 public:
     /// What a node stands for. Nothing branches on it: a raw node is told
     /// from an element by having no name.

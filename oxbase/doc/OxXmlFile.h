@@ -14,6 +14,8 @@
 #ifndef OXBASE_DOC_OXXMLFILE_H
 #define OXBASE_DOC_OXXMLFILE_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/core/OxGList.h"
 #include "oxbase/core/OxTypes.h"
 #include "oxbase/diag/OxPrt.h"
@@ -31,7 +33,7 @@ class OxXmlStore;
 } // namespace detail
 } // namespace oxbase
 
-class OxXmlFile {
+class OXBASE_API OxXmlFile {
 public:
     // The vocabulary of documents. Markers and literals the reader and writer
     // use, and names of attributes and elements for callers.

@@ -10,9 +10,11 @@
 #ifndef OXBASE_DOC_OXXMLFILELIST_H
 #define OXBASE_DOC_OXXMLFILELIST_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/io/OxFileList.h"
 
-class OxXmlFileList : public OxFileList {
+class OXBASE_API OxXmlFileList : public OxFileList {
 public:
     /// As OxFileList(), with the ".xml" filter as the tree-walk callback.
     OxXmlFileList();

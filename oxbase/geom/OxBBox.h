@@ -15,6 +15,8 @@
 #ifndef OXBASE_GEOM_OXBBOX_H
 #define OXBASE_GEOM_OXBBOX_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/core/OxTypes.h"
 
 class OxInput;
@@ -23,7 +25,7 @@ class OxVec3d;
 class OxBBox;
 
 /// A bounding box in float precision.
-class OxBBoxf {
+class OXBASE_API OxBBoxf {
 public:
     /// Empty: flag set, 3.4028234663852886e+38 in the lower fields and its
     /// negative in the upper ones.
@@ -79,7 +81,7 @@ private:
 };
 
 /// A bounding box in double precision.
-class OxBBox {
+class OXBASE_API OxBBox {
 public:
     /// Empty: flag set, the largest double in the lower fields and the most
     /// negative double in the upper ones.
@@ -127,7 +129,7 @@ private:
 };
 
 /// A bounding rectangle in the (U, V) parameter plane, in double precision.
-class OxBRect {
+class OXBASE_API OxBRect {
 public:
     /// Empty: flag set, the largest double in umin, vmin and the most
     /// negative double in umax, vmax.
@@ -163,15 +165,15 @@ private:
 /// The union of a and b, a new object that is not empty: every lower field
 /// the smaller of the two, every upper field the larger (a NaN field yields
 /// to a number). The flags are not looked at.
-OxBBox operator+(const OxBBox& a, const OxBBox& b);
-OxBBoxf operator+(const OxBBoxf& a, const OxBBoxf& b);
-OxBRect operator+(const OxBRect& a, const OxBRect& b);
+OXBASE_API OxBBox operator+(const OxBBox& a, const OxBBox& b);
+OXBASE_API OxBBoxf operator+(const OxBBoxf& a, const OxBBoxf& b);
+OXBASE_API OxBRect operator+(const OxBRect& a, const OxBRect& b);
 
 /// 1 when every field differs by at most the fixed 1e-5 (not OxEPSPtPt); the
 /// flags are not compared. In OxBBoxf the difference is taken in float.
-int operator==(const OxBBox& a, const OxBBox& b);
-int operator!=(const OxBBox& a, const OxBBox& b);
-int operator==(const OxBBoxf& a, const OxBBoxf& b);
-int operator!=(const OxBBoxf& a, const OxBBoxf& b);
+OXBASE_API int operator==(const OxBBox& a, const OxBBox& b);
+OXBASE_API int operator!=(const OxBBox& a, const OxBBox& b);
+OXBASE_API int operator==(const OxBBoxf& a, const OxBBoxf& b);
+OXBASE_API int operator!=(const OxBBoxf& a, const OxBBoxf& b);
 
 #endif

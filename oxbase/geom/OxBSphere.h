@@ -14,6 +14,8 @@
 #ifndef OXBASE_GEOM_OXBSPHERE_H
 #define OXBASE_GEOM_OXBSPHERE_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/core/OxTypes.h"
 
 class OxInput;
@@ -22,7 +24,7 @@ class OxVec3d;
 class OxBSphere;
 
 /// A bounding sphere in float precision.
-class OxBSpheref {
+class OXBASE_API OxBSpheref {
 public:
     /// Empty: all four 0.0.
     OxBSpheref();
@@ -67,7 +69,7 @@ private:
 };
 
 /// A bounding sphere in double precision.
-class OxBSphere {
+class OXBASE_API OxBSphere {
 public:
     /// Empty: all four 0.0.
     OxBSphere();

@@ -11,6 +11,8 @@
 #ifndef OXBASE_GEOM_OXCOLOR_H
 #define OXBASE_GEOM_OXCOLOR_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/core/OxTypes.h"
 
 #include <ostream>
@@ -18,7 +20,7 @@
 class OxInput;
 class OxOutput;
 
-class OxColor {
+class OXBASE_API OxColor {
 public:
     /// Not set; all channels 1.0.
     OxColor();
@@ -67,10 +69,10 @@ private:
 };
 
 /// "(r,g,b)" at precision 10, or "    Color is not set.\n" for an unset colour.
-std::ostream& operator<<(std::ostream& stream, const OxColor& color);
+OXBASE_API std::ostream& operator<<(std::ostream& stream, const OxColor& color);
 /// 1 when every channel differs by at most OxEPSZero; the set flag is not compared.
-int operator==(const OxColor& a, const OxColor& b);
+OXBASE_API int operator==(const OxColor& a, const OxColor& b);
 /// 1 when any channel differs by more than OxEPSZero.
-int operator!=(const OxColor& a, const OxColor& b);
+OXBASE_API int operator!=(const OxColor& a, const OxColor& b);
 
 #endif

@@ -11,9 +11,11 @@
 #ifndef OXBASE_GEOM_OXLIMITS_H
 #define OXBASE_GEOM_OXLIMITS_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/core/OxTypes.h"
 
-class OxLimits {
+class OXBASE_API OxLimits {
 public:
     static double OxEPSZero;      ///< "Zero tolerance"
     static double OxEPSZeroSqr;   ///< OxEPSZero squared, stored by setEPSZero

@@ -14,6 +14,8 @@
 #ifndef OXBASE_GEOM_OXLINE_H
 #define OXBASE_GEOM_OXLINE_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/core/OxTypes.h"
 #include "oxbase/geom/OxVec.h"
 
@@ -26,7 +28,7 @@ class OxPlane;
 #pragma push_macro("INFINITE")
 #undef INFINITE
 
-class OxLine {
+class OXBASE_API OxLine {
 public:
     enum TYPE { FINITE = 0, INFINITE = 1 };
 
@@ -87,6 +89,6 @@ private:
 /// At precision 10: "Position: " right-aligned in a field of 18, the position,
 /// ", Direction : " and the direction, each vector in the form of OxVec3d's
 /// operator<<. No line end.
-std::ostream& operator<<(std::ostream& stream, const OxLine& line);
+OXBASE_API std::ostream& operator<<(std::ostream& stream, const OxLine& line);
 
 #endif

@@ -12,11 +12,13 @@
 #ifndef OXBASE_GEOM_OXMATRIX_H
 #define OXBASE_GEOM_OXMATRIX_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include <ostream>
 
 class OxVec3d;
 
-class OxMatrix {
+class OXBASE_API OxMatrix {
 public:
     double m[4][4];
 
@@ -65,6 +67,6 @@ public:
 /// "\n[ \n", then each row as four elements of width 12 at precision 8, each
 /// followed by ", ", and "\n"; then "]" with no line end. The `right` flag is
 /// set for the rows and cleared after them; the precision stays at 8.
-std::ostream& operator<<(std::ostream& stream, const OxMatrix& matrix);
+OXBASE_API std::ostream& operator<<(std::ostream& stream, const OxMatrix& matrix);
 
 #endif

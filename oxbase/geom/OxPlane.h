@@ -11,13 +11,15 @@
 #ifndef OXBASE_GEOM_OXPLANE_H
 #define OXBASE_GEOM_OXPLANE_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/core/OxTypes.h"
 #include "oxbase/geom/OxVec.h"
 
 class OxLine;
 class OxRot;
 
-class OxPlane {
+class OXBASE_API OxPlane {
 public:
     /// Origin and normal both (0, 0, 0).
     OxPlane();

@@ -12,6 +12,8 @@
 #ifndef OXBASE_GEOM_OXROT_H
 #define OXBASE_GEOM_OXROT_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/core/OxTypes.h"
 #include "oxbase/geom/OxVec.h"
 
@@ -20,7 +22,7 @@
 class OxInput;
 class OxOutput;
 
-class OxRot {
+class OXBASE_API OxRot {
 public:
     double m[3][3];
 
@@ -80,7 +82,7 @@ public:
     long long writeValue(OxOutput& output) const;
 };
 
-class OxRot2d {
+class OXBASE_API OxRot2d {
 public:
     double m[2][2];
 
@@ -121,17 +123,17 @@ public:
 };
 
 /// The matrix product a·b.
-OxRot operator*(const OxRot& a, const OxRot& b);
-OxRot2d operator*(const OxRot2d& a, const OxRot2d& b);
+OXBASE_API OxRot operator*(const OxRot& a, const OxRot& b);
+OXBASE_API OxRot2d operator*(const OxRot2d& a, const OxRot2d& b);
 /// Each element within the fixed 1e-5.
-int operator==(const OxRot& a, const OxRot& b);
-int operator!=(const OxRot& a, const OxRot& b);
-int operator==(const OxRot2d& a, const OxRot2d& b);
-int operator!=(const OxRot2d& a, const OxRot2d& b);
-std::ostream& operator<<(std::ostream& stream, const OxRot& rot);
-std::ostream& operator<<(std::ostream& stream, const OxRot2d& rot);
+OXBASE_API int operator==(const OxRot& a, const OxRot& b);
+OXBASE_API int operator!=(const OxRot& a, const OxRot& b);
+OXBASE_API int operator==(const OxRot2d& a, const OxRot2d& b);
+OXBASE_API int operator!=(const OxRot2d& a, const OxRot2d& b);
+OXBASE_API std::ostream& operator<<(std::ostream& stream, const OxRot& rot);
+OXBASE_API std::ostream& operator<<(std::ostream& stream, const OxRot2d& rot);
 
 /// The identity matrix, set up when the library is loaded.
-extern const OxRot OX_IDENTITY_3X3_MATRIX;
+extern OXBASE_API const OxRot OX_IDENTITY_3X3_MATRIX;
 
 #endif

@@ -16,6 +16,8 @@
 #ifndef OXBASE_GEOM_OXVEC_H
 #define OXBASE_GEOM_OXVEC_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/core/OxTypes.h"
 
 #include <ostream>
@@ -26,7 +28,7 @@ class OxMemory;
 class OxRot;
 class OxRot2d;
 
-class OxVec2d {
+class OXBASE_API OxVec2d {
 public:
     double x = 0.0;
     double y = 0.0;
@@ -100,7 +102,7 @@ public:
     long long writeValue(OxOutput& output) const;
 };
 
-class OxVec3d {
+class OXBASE_API OxVec3d {
 public:
     double x = 0.0;
     double y = 0.0;
@@ -176,7 +178,7 @@ public:
     long long writeValue(OxOutput& output) const;
 };
 
-class OxVec4d {
+class OXBASE_API OxVec4d {
 public:
     double x = 0.0;
     double y = 0.0;
@@ -252,38 +254,38 @@ public:
     long long writeValue(OxOutput& output) const;
 };
 
-OxVec2d operator+(const OxVec2d& a, const OxVec2d& b);
-OxVec2d operator-(const OxVec2d& a, const OxVec2d& b);
-OxVec2d operator*(const OxVec2d& v, double factor);
-OxVec2d operator*(double factor, const OxVec2d& v);
+OXBASE_API OxVec2d operator+(const OxVec2d& a, const OxVec2d& b);
+OXBASE_API OxVec2d operator-(const OxVec2d& a, const OxVec2d& b);
+OXBASE_API OxVec2d operator*(const OxVec2d& v, double factor);
+OXBASE_API OxVec2d operator*(double factor, const OxVec2d& v);
 /// A divisor of exactly 0.0 gives the zero vector.
-OxVec2d operator/(const OxVec2d& v, double divisor);
+OXBASE_API OxVec2d operator/(const OxVec2d& v, double divisor);
 /// Per coordinate: OxEPSZero >= |a − b| − OxEPSPtPt.
-int operator==(const OxVec2d& a, const OxVec2d& b);
+OXBASE_API int operator==(const OxVec2d& a, const OxVec2d& b);
 /// Any coordinate different, compared exactly.
-int operator!=(const OxVec2d& a, const OxVec2d& b);
+OXBASE_API int operator!=(const OxVec2d& a, const OxVec2d& b);
 /// Each coordinate at precision 10 and width 18, no separator, no line end.
-std::ostream& operator<<(std::ostream& stream, const OxVec2d& v);
+OXBASE_API std::ostream& operator<<(std::ostream& stream, const OxVec2d& v);
 
-OxVec3d operator+(const OxVec3d& a, const OxVec3d& b);
-OxVec3d operator-(const OxVec3d& a, const OxVec3d& b);
-OxVec3d operator*(const OxVec3d& v, double factor);
-OxVec3d operator*(double factor, const OxVec3d& v);
-OxVec3d operator/(const OxVec3d& v, double divisor);
-int operator==(const OxVec3d& a, const OxVec3d& b);
-int operator!=(const OxVec3d& a, const OxVec3d& b);
-std::ostream& operator<<(std::ostream& stream, const OxVec3d& v);
+OXBASE_API OxVec3d operator+(const OxVec3d& a, const OxVec3d& b);
+OXBASE_API OxVec3d operator-(const OxVec3d& a, const OxVec3d& b);
+OXBASE_API OxVec3d operator*(const OxVec3d& v, double factor);
+OXBASE_API OxVec3d operator*(double factor, const OxVec3d& v);
+OXBASE_API OxVec3d operator/(const OxVec3d& v, double divisor);
+OXBASE_API int operator==(const OxVec3d& a, const OxVec3d& b);
+OXBASE_API int operator!=(const OxVec3d& a, const OxVec3d& b);
+OXBASE_API std::ostream& operator<<(std::ostream& stream, const OxVec3d& v);
 
 /// All four, w included.
-OxVec4d operator+(const OxVec4d& a, const OxVec4d& b);
-OxVec4d operator-(const OxVec4d& a, const OxVec4d& b);
+OXBASE_API OxVec4d operator+(const OxVec4d& a, const OxVec4d& b);
+OXBASE_API OxVec4d operator-(const OxVec4d& a, const OxVec4d& b);
 /// x, y, z scaled; w copied.
-OxVec4d operator*(const OxVec4d& v, double factor);
-OxVec4d operator*(double factor, const OxVec4d& v);
+OXBASE_API OxVec4d operator*(const OxVec4d& v, double factor);
+OXBASE_API OxVec4d operator*(double factor, const OxVec4d& v);
 /// All four divided, with no test of the divisor.
-OxVec4d operator/(const OxVec4d& v, double divisor);
-int operator==(const OxVec4d& a, const OxVec4d& b);
-int operator!=(const OxVec4d& a, const OxVec4d& b);
-std::ostream& operator<<(std::ostream& stream, const OxVec4d& v);
+OXBASE_API OxVec4d operator/(const OxVec4d& v, double divisor);
+OXBASE_API int operator==(const OxVec4d& a, const OxVec4d& b);
+OXBASE_API int operator!=(const OxVec4d& a, const OxVec4d& b);
+OXBASE_API std::ostream& operator<<(std::ostream& stream, const OxVec4d& v);
 
 #endif

@@ -17,12 +17,14 @@
 #ifndef OXBASE_IO_OXFILE_H
 #define OXBASE_IO_OXFILE_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/core/OxGList.h"
 #include "oxbase/core/OxTypes.h"
 
 #include <ios>
 
-class OxFile {
+class OXBASE_API OxFile {
 public:
     /// How a stream opens its file. The streams treat every value other than
     /// FILE_MODE_BINARY as text mode.

@@ -15,11 +15,13 @@
 #ifndef OXBASE_IO_OXFILELIST_H
 #define OXBASE_IO_OXFILELIST_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/core/OxGList.h"
 #include "oxbase/core/OxTypes.h"
 #include "oxbase/io/OxFileTreeWalk.h"
 
-class OxFileList {
+class OXBASE_API OxFileList {
 public:
     /// Empty lists, no second-choice path, no callback.
     OxFileList();

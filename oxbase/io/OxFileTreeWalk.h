@@ -5,7 +5,8 @@
 // deep the tree, at most `maxStreams` directory streams are open at once:
 // when the ring of stream slots is full, the oldest open directory is read to
 // its end into memory and its stream closed. An inode table keeps the walk
-// from entering a directory twice, so links to ancestors cause no loop.
+// from entering a directory twice, so links to ancestors cause no loop where
+// the file system has inode numbers (POSIX; see Windows below).
 //
 //   int count(const char *, const OxStat *, OxFileTreeWalkType, void * n) {
 //       ++*static_cast<int *>(n);
@@ -18,9 +19,23 @@
 // The walk moves the working directory of the process while it runs and
 // restores it at the end; it is for one thread at a time. Failures are
 // reported on standard error (not through OxMsg). A relative start path is
-// made absolute against the working directory first.
+// made absolute against the working directory first. Paths given to the
+// callback use the platform's separator: '\\' on Windows, '/' on POSIX.
+//
+// Windows: its status record (_stat64i32) has no inode numbers; every
+// status says inode 0, which the inode table never records. There the table
+// stays empty and stops nothing: a second run of one object reports the tree
+// again, and a directory reached twice (a junction or directory link to
+// another place in the tree) is walked each time. A link back to an ancestor
+// is followed round and round until the path outgrows the 260 characters
+// that the runtime's calls take: then the status call of an entry fails
+// with errno 2 (the entry is passed over in silence, as a vanished one) or
+// the listing of a directory fails (its debug text, and the directory is
+// reported without entries), and the walk comes back up and ends.
 #ifndef OXBASE_IO_OXFILETREEWALK_H
 #define OXBASE_IO_OXFILETREEWALK_H
+
+#include "oxbase/platform/OxExport.h"
 
 #include "oxbase/io/OxInodeTable.h"
 #include "oxbase/platform/OxStat.h"
@@ -48,7 +63,7 @@ enum OxFileTreeWalkType {
 typedef int (*OxFileTreeWalkCallback)(const char* path, const OxStat* status,
                                       OxFileTreeWalkType type, void* userData);
 
-class OxFileTreeWalk {
+class OXBASE_API OxFileTreeWalk {
 public:
     /// One directory being read: its stream, or the names read ahead when the
     /// stream was parked (each ended by a zero byte, the whole by one more).

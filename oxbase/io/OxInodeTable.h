@@ -15,6 +15,8 @@
 #ifndef OXBASE_IO_OXINODETABLE_H
 #define OXBASE_IO_OXINODETABLE_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/core/OxGList.h"
 #include "oxbase/core/OxTypes.h"
 #include "oxbase/platform/OxStat.h"
@@ -22,7 +24,7 @@
 #include <cstdint>
 
 /// The inode numbers seen on one device.
-class OxInodeDevice {
+class OXBASE_API OxInodeDevice {
 public:
     /// Stores the id and allocates 13 free slots.
     explicit OxInodeDevice(std::uint64_t deviceId);
@@ -73,7 +75,7 @@ private:
 };
 
 /// The devices met, in the order first met; the table owns them.
-class OxInodeTable {
+class OXBASE_API OxInodeTable {
 public:
     OxInodeTable() = default;
     OxInodeTable(const OxInodeTable&) = delete;

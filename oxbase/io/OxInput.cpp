@@ -172,6 +172,28 @@ long long OxInput::read(unsigned char* buffer, unsigned int length) {
     return read(reinterpret_cast<char*>(buffer), length);
 }
 
+long long OxInput::readText(char* buffer, unsigned int length) {
+    const char* text = filename != nullptr ? filename : "";
+    if (stream == nullptr || (buffer == nullptr && length != 0)) {
+        OxMsg::Log(OxMsgFileRead, text);
+        return 0;
+    }
+    if (!stream->good()) {
+        OxMsg::Log(OxMsgFileRead, text);
+        readState();
+        return 0;
+    }
+    stream->read(buffer, static_cast<std::streamsize>(length));
+    if (stream->bad()) {
+        OxMsg::Log(OxMsgFileRead, text);
+        readState();
+        return 0;
+    }
+    // A short read has set the end-of-file and failure flags, as a line
+    // read at the end of a file does: the stream is done, not broken.
+    return static_cast<long long>(stream->gcount());
+}
+
 long long OxInput::readUStoC(char* buffer, unsigned int count, unsigned int& stored) {
     stored = 0;
     if (buffer == nullptr && count != 0) {

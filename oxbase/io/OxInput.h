@@ -16,16 +16,18 @@
 #ifndef OXBASE_IO_OXINPUT_H
 #define OXBASE_IO_OXINPUT_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/io/OxFile.h"
 
 #include <fstream>
 
 /// `value` with its 8 bytes in reverse order (a bit-pattern operation).
-double swapd(double value);
+OXBASE_API double swapd(double value);
 /// `value` with its 4 bytes in reverse order (a bit-pattern operation).
-float swapf(float value);
+OXBASE_API float swapf(float value);
 
-class OxInput : public OxFile {
+class OXBASE_API OxInput : public OxFile {
 public:
     /// Opens `name` for input (binary mode for FILE_MODE_BINARY, text mode
     /// otherwise) and measures its length. On failure logs 1 and the state;
@@ -52,6 +54,14 @@ public:
     /// fails (2 and the state; bytes that arrived stay in `buffer`).
     long long read(char* buffer, unsigned int length);
     long long read(unsigned char* buffer, unsigned int length);
+    /// Up to `length` characters as the stream delivers them, for readers of
+    /// text that read in blocks: in text mode on Windows each CR LF of the
+    /// file arrives as one "\n", so a text file gives fewer characters than
+    /// its length. Fewer than `length` only at the end of the file, which
+    /// sets the end-of-file flag and is no failure: the count is returned,
+    /// nothing is logged. A state that is not clean before the call, a read
+    /// error or a null `buffer` give 0 with 2 and the state logged.
+    long long readText(char* buffer, unsigned int length);
 
     /// Reads `count` 16-bit units and stores the low 7 bits of each second
     /// byte; `stored` counts the characters. Returns 2 * count. No terminator.

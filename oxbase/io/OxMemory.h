@@ -14,11 +14,13 @@
 #ifndef OXBASE_IO_OXMEMORY_H
 #define OXBASE_IO_OXMEMORY_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/core/OxTypes.h"
 
 #include <cstddef>
 
-class OxMemory {
+class OXBASE_API OxMemory {
 public:
     /// The reference point of a seek.
     enum DIR { DIR_CURRENT = 0, DIR_BEGIN = 1 };

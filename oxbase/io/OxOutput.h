@@ -18,12 +18,14 @@
 #ifndef OXBASE_IO_OXOUTPUT_H
 #define OXBASE_IO_OXOUTPUT_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/io/OxFile.h"
 
 #include <fstream>
 #include <ios>
 
-class OxOutput : public OxFile {
+class OXBASE_API OxOutput : public OxFile {
 public:
     /// Prepares the directory of `name` and opens it for output with
     /// truncation (binary mode for FILE_MODE_BINARY, text mode otherwise).

@@ -25,6 +25,8 @@
 #ifndef OXBASE_RANGES_OXRANGELIST_H
 #define OXBASE_RANGES_OXRANGELIST_H
 
+#include "oxbase/platform/OxExport.h"
+
 #include "oxbase/core/OxGBinaryTree.h"
 #include "oxbase/core/OxGList.h"
 #include "oxbase/core/OxTypes.h"
@@ -38,7 +40,7 @@ struct OxRangeListRecord {
 /// The list owns its records: they are deleted when they leave it and by the
 /// destructor. Records keep the order in which they came until sort or compact
 /// runs; a list that is not compact may hold overlapping and repeated records.
-class OxRangeList : public OxGList<OxRangeListRecord*> {
+class OXBASE_API OxRangeList : public OxGList<OxRangeListRecord*> {
 public:
     /// An empty list; isValid() is OxFalse.
     OxRangeList();

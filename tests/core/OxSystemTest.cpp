@@ -126,13 +126,45 @@ TEST(OxSystemTest, EnvironmentAndOperatingSystem) {
     EXPECT_EQ(OxSystem::isEnvVarSet("PATH"), OxTrue);
 
     EXPECT_EQ(static_cast<int>(OxSystem::OxOSWindows), 7);
-    EXPECT_EQ(static_cast<int>(OxSystem::getOS()), 8); // OxOSLinux
-
     char* name = OxSystem::getOSName(); // host name, blank, system name, blank
     ASSERT_NE(name, nullptr);
     std::string text = name;
     delete[] name;
-    ASSERT_GT(text.size(), 7u);
     EXPECT_NE(text[0], ' ');
+#ifdef _WIN32
+    EXPECT_EQ(static_cast<int>(OxSystem::getOS()), 7);
+    // The computer name fits the 16 wide characters that are asked for.
+    const std::string system = " Microsoft Windows ";
+    ASSERT_GT(text.size(), system.size());
+    EXPECT_LE(text.size() - system.size(), 15u);
+    EXPECT_EQ(text.substr(text.size() - system.size()), system);
+#else
+    EXPECT_EQ(static_cast<int>(OxSystem::getOS()), 8); // OxOSLinux
+    ASSERT_GT(text.size(), 7u);
     EXPECT_EQ(text.substr(text.size() - 7), " Linux ");
+#endif
+}
+
+// The 64-bit time calls of the Windows runtime take 1970 to 3000 only; the
+// POSIX calls go on before and after.
+TEST(OxSystemTest, TimesOutsideTheRuntimeRange) {
+    const long long before1970 = -86400;       // 1969-12-31 00:00:00 UTC
+    const long long after3000 = 32535216000LL; // 3001-01-01 00:00:00 UTC
+#ifdef _WIN32
+    EXPECT_EQ(OxSystem::gmtime(&before1970), nullptr);
+    EXPECT_EQ(OxSystem::localtime(&before1970), nullptr);
+    EXPECT_EQ(OxSystem::ctime(&after3000), nullptr);
+    EXPECT_EQ(OxSystem::gmtime(&after3000), nullptr);
+    const long long last = after3000 - 1;
+    tm* end = OxSystem::gmtime(&last);
+    ASSERT_NE(end, nullptr);
+    EXPECT_STREQ(OxSystem::asctime(end), "Wed Dec 31 23:59:59 3000\n");
+#else
+    tm* day = OxSystem::gmtime(&before1970);
+    ASSERT_NE(day, nullptr);
+    EXPECT_STREQ(OxSystem::asctime(day), "Wed Dec 31 00:00:00 1969\n");
+    tm* later = OxSystem::gmtime(&after3000);
+    ASSERT_NE(later, nullptr);
+    EXPECT_STREQ(OxSystem::asctime(later), "Thu Jan  1 00:00:00 3001\n");
+#endif
 }

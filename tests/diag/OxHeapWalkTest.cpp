@@ -1,7 +1,8 @@
-// OxHeapInfo on the platform's own heap walk. The exact expectations follow
-// glibc's main arena, which the Linux walker reads; elsewhere, and where the
-// walker is off (sanitizer builds, valgrind), the tests skip or check that
-// the walk ends at once.
+// OxHeapInfo on the platform's own heap walk: glibc's main arena, which the
+// Linux walker reads, and the runtime's _heapwalk on Windows. One test
+// follows glibc's layout exactly; the others hold for any heap whose walk
+// delivers blocks. Where the walker is off (sanitizer builds, valgrind) the
+// tests skip or check that the walk ends at once.
 #include "oxbase/core/OxSystem.h"
 #include "oxbase/diag/OxHeapInfo.h"
 #include "oxbase/platform/detail/OxPlatformHeap.h"
@@ -18,6 +19,12 @@ using namespace oxbase::detail;
 
 namespace {
 
+/// The blocks of the diff tests: 1,000 of 3,000 bytes each, cut from a run
+/// of freed 16,000-byte blocks.
+constexpr size_t kSize = 3000;
+constexpr unsigned int kBlocks = 1000;
+constexpr size_t kRunSize = 16000;
+
 const char* const kUnavailable = "the platform's heap walk delivers no blocks in this process "
                                  "(sanitizer build, valgrind, another allocator or platform)";
 
@@ -27,6 +34,109 @@ std::uintptr_t addressOf(const OxHeapInfo& picture, unsigned int i) {
 
 bool glibcWalker() {
     return OxSystem::getOS() == OxSystem::OxOSLinux && sizeof(void*) == 8;
+}
+
+/// Freed memory below a fence, from which blocks of one size are then cut:
+/// a run of `runSize` blocks is allocated until the latest ones climb in
+/// equal steps over `needed` bytes (the first ones may fill older free
+/// memory, the later ones come from the top of the heap), all but the
+/// highest (the fence) are freed, and blocks of `blockSize` are drained until
+/// one comes from the freed run: by then no other free memory serves that
+/// size. Every vector is reserved before the first allocation, so that the
+/// test allocates nothing else between its pictures.
+struct FreedRun {
+    std::uintptr_t low = 0;
+    std::uintptr_t fence = 0;
+    bool landed = false;
+    std::vector<void*> run;
+    std::vector<void*> drain;
+
+    FreedRun(size_t runSize, size_t blockSize, std::uintptr_t needed) {
+        constexpr unsigned int kMaxRun = 4000;
+        constexpr unsigned int kMaxDrain = 20000;
+        run.reserve(kMaxRun);
+        drain.reserve(kMaxDrain);
+        std::uintptr_t step = 0;
+        while (fence - low < needed && run.size() < kMaxRun) {
+            void* block = std::malloc(runSize);
+            run.push_back(block);
+            auto address = reinterpret_cast<std::uintptr_t>(block);
+            if (address <= fence || address - fence != step) {
+                step = address > fence ? address - fence : 0;
+                low = address;
+            }
+            fence = address;
+        }
+        for (size_t i = 0; i + 1 < run.size(); i++) {
+            std::free(run[i]);
+        }
+        while (!landed && drain.size() < kMaxDrain) {
+            void* block = std::malloc(blockSize);
+            drain.push_back(block);
+            auto address = reinterpret_cast<std::uintptr_t>(block);
+            landed = address >= low && address < fence;
+        }
+    }
+    ~FreedRun() {
+        std::free(run.back());
+        for (void* block : drain) {
+            std::free(block);
+        }
+    }
+    FreedRun(const FreedRun&) = delete;
+    FreedRun& operator=(const FreedRun&) = delete;
+};
+
+/// Takes `before`, makes `count` blocks of `size` into `blocks` (reserved by
+/// the caller, so that nothing else is allocated), takes `after` and returns
+/// after.diff(before), owned by the caller.
+OxHeapInfo* blocksBetweenPictures(OxHeapInfo& before, OxHeapInfo& after, std::vector<void*>& blocks,
+                                  unsigned int count, size_t size) {
+    before.snap();
+    for (unsigned int i = 0; i < count; i++) {
+        blocks.push_back(std::malloc(size));
+    }
+    after.snap();
+    return after.diff(before);
+}
+
+/// Independent reckoning of what a diff against `older` must list of
+/// `blocks`: each block whose address the older picture lacks and that lies
+/// below the highest address it has.
+std::set<std::uintptr_t> newBelowTheOlderTop(const OxHeapInfo& older,
+                                             const std::vector<void*>& blocks) {
+    std::set<std::uintptr_t> known;
+    for (unsigned int i = 0; i < older.getCount(); i++) {
+        known.insert(addressOf(older, i));
+    }
+    std::set<std::uintptr_t> expected;
+    for (void* block : blocks) {
+        auto address = reinterpret_cast<std::uintptr_t>(block);
+        if (!known.empty() && known.count(address) == 0 && address < *known.rbegin()) {
+            expected.insert(address);
+        }
+    }
+    return expected;
+}
+
+/// The addresses of `expected` that `made` lists, each checked to be a used
+/// block of `size` bytes (at least that many unless `exact`).
+std::set<std::uintptr_t> listedOf(const OxHeapInfo& made, const std::set<std::uintptr_t>& expected,
+                                  size_t size, bool exact) {
+    std::set<std::uintptr_t> listed;
+    for (unsigned int i = 0; i < made.getCount(); i++) {
+        std::uintptr_t address = addressOf(made, i);
+        if (expected.count(address) != 0) {
+            listed.insert(address);
+            if (exact) {
+                EXPECT_EQ(made.getEntry(i)->size, size);
+            } else {
+                EXPECT_GE(made.getEntry(i)->size, size);
+            }
+            EXPECT_EQ(made.getEntry(i)->state, 2u);
+        }
+    }
+    return listed;
 }
 
 } // namespace
@@ -122,55 +232,17 @@ TEST(OxHeapWalk, NewBlocksOfOneSizeAreFoundByDiff) {
     if (!glibcWalker()) {
         GTEST_SKIP() << "the exact layout expected here is that of glibc on a 64-bit system";
     }
-    constexpr size_t kSize = 3000;
-    constexpr unsigned int kBlocks = 1000;
-    constexpr size_t kRunSize = 16000;
-    constexpr std::uintptr_t kRunStep = kRunSize + 16; // glibc's chunk of a 16,000-byte block
     // The free chunk holds the 1,000 blocks and the first picture's entry array.
     constexpr std::uintptr_t kNeeded = kBlocks * (kSize + 8) + 512 * 1024;
-    constexpr unsigned int kMaxRun = 2000;
-    constexpr unsigned int kMaxDrain = 10000;
-
-    std::vector<void*> run;
-    std::vector<void*> drain;
     std::vector<void*> blocks;
-    run.reserve(kMaxRun);
-    drain.reserve(kMaxDrain);
     blocks.reserve(kBlocks);
-
-    // Run blocks are allocated until the latest ones climb in equal steps
-    // over enough memory: the first of them may fill older free chunks, the
-    // later ones come from the top of the heap. The last one is the fence.
-    std::uintptr_t low = 0;
-    std::uintptr_t fence = 0;
-    while (fence - low < kNeeded && run.size() < kMaxRun) {
-        void* block = std::malloc(kRunSize);
-        run.push_back(block);
-        auto address = reinterpret_cast<std::uintptr_t>(block);
-        if (address != fence + kRunStep) {
-            low = address;
-        }
-        fence = address;
-    }
-    for (size_t i = 0; i + 1 < run.size(); i++) {
-        std::free(run[i]);
-    }
-    bool landed = false;
-    while (!landed && drain.size() < kMaxDrain) {
-        void* block = std::malloc(kSize);
-        drain.push_back(block);
-        auto address = reinterpret_cast<std::uintptr_t>(block);
-        landed = address >= low && address < fence;
-    }
+    FreedRun prepared(kRunSize, kSize, kNeeded);
+    const std::uintptr_t low = prepared.low;
+    const std::uintptr_t fence = prepared.fence;
 
     OxHeapInfo before;
-    before.snap();
-    for (unsigned int i = 0; i < kBlocks; i++) {
-        blocks.push_back(std::malloc(kSize));
-    }
     OxHeapInfo after;
-    after.snap();
-    OxHeapInfo* made = after.diff(before);
+    OxHeapInfo* made = blocksBetweenPictures(before, after, blocks, kBlocks, kSize);
     for (void* block : blocks) {
         std::free(block);
     }
@@ -179,23 +251,14 @@ TEST(OxHeapWalk, NewBlocksOfOneSizeAreFoundByDiff) {
 
     // Premises of the layout.
     ASSERT_GE(fence - low, kNeeded) << "no run of blocks one behind the other";
-    ASSERT_TRUE(landed);
+    ASSERT_TRUE(prepared.landed);
     ASSERT_NE(made, nullptr);
 
-    // Independent reckoning of what the diff must list: a new block whose
-    // address the first picture lacks and that lies below its highest one.
-    std::set<std::uintptr_t> older;
-    for (unsigned int i = 0; i < before.getCount(); i++) {
-        older.insert(addressOf(before, i));
-    }
-    std::set<std::uintptr_t> expected;
     for (void* block : blocks) {
         auto address = reinterpret_cast<std::uintptr_t>(block);
         EXPECT_TRUE(address > low && address < fence);
-        if (older.count(address) == 0 && address < *older.rbegin()) {
-            expected.insert(address);
-        }
     }
+    std::set<std::uintptr_t> expected = newBelowTheOlderTop(before, blocks);
     // The first block sits where the first picture saw the free chunk.
     auto first = reinterpret_cast<std::uintptr_t>(blocks[0]);
     bool firstWasFree = false;
@@ -207,17 +270,7 @@ TEST(OxHeapWalk, NewBlocksOfOneSizeAreFoundByDiff) {
     EXPECT_TRUE(firstWasFree);
     EXPECT_EQ(expected.size(), kBlocks - 1);
     EXPECT_EQ(expected.count(first), 0u);
-
-    std::set<std::uintptr_t> listed;
-    for (unsigned int i = 0; i < made->getCount(); i++) {
-        std::uintptr_t address = addressOf(*made, i);
-        if (expected.count(address) != 0) {
-            listed.insert(address);
-            EXPECT_EQ(made->getEntry(i)->size, kSize);
-            EXPECT_EQ(made->getEntry(i)->state, 2u);
-        }
-    }
-    EXPECT_EQ(listed, expected);
+    EXPECT_EQ(listedOf(*made, expected, kSize, true), expected);
     delete made;
 
     // After freeing, no block of the 1,000 is a used block of the third
@@ -239,9 +292,51 @@ TEST(OxHeapWalk, NewBlocksOfOneSizeAreFoundByDiff) {
         }
         EXPECT_TRUE(covered) << "block at " << block;
     }
+}
 
-    std::free(run.back());
-    for (void* block : drain) {
+// The same question on any heap whose walk delivers blocks, the Windows heap
+// of _heapwalk in particular, without knowing the allocator's layout: 1,000
+// blocks made between two pictures inside the first picture's address range
+// are what diff lists.
+//
+// The range is prepared as above, with what any allocator that reuses freed
+// memory does: a run of large blocks is allocated until the latest ones lie
+// one behind the other in equal steps, all but the highest (the fence) are
+// freed, and blocks of the test's size are drained until one comes from the
+// freed run. The later blocks then come from there too, below the fence.
+// What diff must list is reckoned independently from the first picture's
+// addresses: every new block that the first picture lacks and that lies
+// below its highest address. The first new block may start where the first
+// picture saw the free memory it was cut from; all the others must count.
+TEST(OxHeapWalk, NewBlocksInsideTheOlderRangeAreFoundByDiff) {
+    ASSERT_EQ(OxHeapInfo::setWalkFunction(nullptr), nullptr);
+    if (OxHeapInfo::isPlatformWalkAvailable() == OxFalse) {
+        GTEST_SKIP() << kUnavailable;
+    }
+    // Room for the blocks with any allocator's headers, and for the entry
+    // array of the first picture.
+    constexpr std::uintptr_t kRoom = kBlocks * (kSize + 64) + 1024 * 1024;
+    std::vector<void*> blocks;
+    blocks.reserve(kBlocks);
+    FreedRun prepared(kRunSize, kSize, kRoom);
+    OxHeapInfo before;
+    OxHeapInfo after;
+    std::unique_ptr<OxHeapInfo> made(blocksBetweenPictures(before, after, blocks, kBlocks, kSize));
+
+    ASSERT_GE(prepared.fence - prepared.low, kRoom) << "no run of blocks one behind the other";
+    ASSERT_TRUE(prepared.landed) << "no block of the test's size came from the freed run";
+    ASSERT_NE(made, nullptr);
+    unsigned int inside = 0;
+    for (void* block : blocks) {
+        auto address = reinterpret_cast<std::uintptr_t>(block);
+        inside += address >= prepared.low && address < prepared.fence ? 1 : 0;
+    }
+    EXPECT_EQ(inside, kBlocks);
+    std::set<std::uintptr_t> expected = newBelowTheOlderTop(before, blocks);
+    EXPECT_GE(expected.size(), kBlocks - 1);
+    EXPECT_EQ(listedOf(*made, expected, kSize, false), expected);
+
+    for (void* block : blocks) {
         std::free(block);
     }
 }

@@ -40,7 +40,7 @@ protected:
         OxMsg::setMsgCallbackUserData(&callbackTexts);
         return msg;
     }
-    std::string log() { return oxtest::readFile(dir.file("run.log")); }
+    std::string log() { return oxtest::readText(dir.file("run.log")); }
 };
 } // namespace
 
@@ -107,7 +107,7 @@ TEST_F(OxMsgTest, RoutingOfInfoMessages) {
     OxMsg::Log("plain text|");
     OxMsg::LogForce("forced text|");
     EXPECT_EQ(testing::internal::GetCapturedStderr(), "forced text|");
-    EXPECT_EQ(oxtest::readFile(dir.file("second.log")), "plain text|forced text|");
+    EXPECT_EQ(oxtest::readText(dir.file("second.log")), "plain text|forced text|");
 
     testing::internal::CaptureStderr();
     msg->openLogFile("  ", nullptr);
@@ -211,8 +211,8 @@ TEST_F(OxMsgTest, StartUpFailuresAndLookup) {
         OxMsg::Log("nothing");
     }
     EXPECT_EQ(testing::internal::GetCapturedStderr(),
-              "Unable to open absent.msg\nTried " + dir.path() +
-                  "/absent.msg and absent.msg,\nin current working directory, " + cwd + "\n");
+              "Unable to open absent.msg\nTried " + dir.file("absent.msg") +
+                  " and absent.msg,\nin current working directory, " + cwd + "\n");
 
     // A relative name is found in the directory argument, and the working
     // directory comes first when both have it.
@@ -234,18 +234,18 @@ TEST_F(OxMsgTest, StartUpFailuresAndLookup) {
     {
         oxtest::writeFile(dir.file("test.msg"), kMessages);
         OxMsg badLog(dir.file("test.msg").c_str(), nullptr, "run.log",
-                     (dir.path() + "/no/such/dir").c_str());
+                     dir.file("no/such/dir").c_str());
         EXPECT_EQ(OxMsg::isValid(), OxFalse);
     }
     EXPECT_EQ(testing::internal::GetCapturedStderr(),
-              " Unable to open " + dir.path() + "/no/such/dir/run.log\n");
+              " Unable to open " + dir.file("no/such/dir/run.log") + "\n");
 
     // A second start while a failed one still stands reads into the same
     // table (its lines continue the known messages) and takes over what the
     // first took: nothing is leaked (LeakSanitizer watches the asan build).
     testing::internal::CaptureStderr();
     {
-        std::string noDir = dir.path() + "/no/such/dir";
+        std::string noDir = dir.file("no/such/dir");
         OxMsg first(dir.file("test.msg").c_str(), nullptr, "run.log", noDir.c_str());
         OxMsg second(dir.file("test.msg").c_str(), nullptr, "run.log", noDir.c_str());
         EXPECT_EQ(OxMsg::isValid(), OxFalse);

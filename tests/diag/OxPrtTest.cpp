@@ -132,7 +132,7 @@ TEST(OxPrtTest, FlushReachesCallbackAndLog) {
     std::string err = testing::internal::GetCapturedStderr();
     EXPECT_EQ(logged.text, "to the log\ntraced\n");
     EXPECT_NE(err.find("to the log\n"), std::string::npos);
-    EXPECT_NE(oxtest::readFile(dir.file("prt.log")).find("to the log\ntraced\n"),
+    EXPECT_NE(oxtest::readText(dir.file("prt.log")).find("to the log\ntraced\n"),
               std::string::npos);
 }
 

@@ -74,7 +74,7 @@ TEST_F(CsvTest, WriteBackPadsMissingFieldsAtTheEnd) {
     ASSERT_EQ(csv->open(out.c_str(), OxFile::OxIOOutput), 0);
     log.take();
     ASSERT_EQ(csv->writeFile(), OxTrue);
-    EXPECT_EQ(oxtest::readFile(out), "a,b,c\n1,3,\n");
+    EXPECT_EQ(oxtest::readText(out), "a,b,c\n1,3,\n");
     EXPECT_EQ(log.take(), std::vector<std::string>{"m578 " + out});
 
     // No columns: the first record's field count is the width; a quoted value
@@ -97,7 +97,7 @@ TEST_F(CsvTest, WriteBackPadsMissingFieldsAtTheEnd) {
     root->addChild(wide);
     plain.setRoot(root);
     ASSERT_EQ(plain.writeFile(), OxTrue);
-    EXPECT_EQ(oxtest::readFile(dir.file("plain.csv")), "1,2,3\n4,,\n\"a,b\",x,\na,b,\n");
+    EXPECT_EQ(oxtest::readText(dir.file("plain.csv")), "1,2,3\n4,,\n\"a,b\",x,\na,b,\n");
 
     OxCsvFile closed(nullptr, OxFile::OxIOInput);
     EXPECT_EQ(closed.writeFile(), OxFalse);

@@ -23,5 +23,5 @@ TEST(OxXmlLongText, LongCommentRoundTripsExactly) {
     EXPECT_EQ(in.getRoot()->isNamed("root"), OxTrue);
     in.open(dir.file("out.xml").c_str(), OxFile::OxIOOutput);
     ASSERT_EQ(in.writeFile(), OxTrue);
-    EXPECT_TRUE(oxtest::readFile(dir.file("out.xml")) == document);
+    EXPECT_TRUE(oxtest::readText(dir.file("out.xml")) == document);
 }

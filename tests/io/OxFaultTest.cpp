@@ -31,8 +31,6 @@ using oxiotest::Numbers;
 
 namespace {
 
-#ifndef _WIN32
-
 /// The file-stream messages plus the ends of the document writers.
 class FaultTest : public oxiotest::IoTest {
 protected:
@@ -84,12 +82,17 @@ protected:
     }
 };
 
+#ifndef _WIN32
 /// Whether `shorter` is the start of `longer`.
 bool isPrefix(const std::string& shorter, const std::string& longer) {
     return longer.compare(0, shorter.size(), shorter) == 0;
 }
+#endif
 
 TEST_F(FaultTest, FileSizeLimitUnderEveryWriter) {
+#ifdef _WIN32
+    GTEST_SKIP() << "a file size limit needs a forked child with RLIMIT_FSIZE (POSIX only)";
+#else
     // Typed values wait in the stream buffer; close tells that only part of
     // them reached the file, and what did is their start.
     const std::string values = dir.file("values.bin");
@@ -173,6 +176,7 @@ TEST_F(FaultTest, FileSizeLimitUnderEveryWriter) {
         {false, 4096});
     EXPECT_EQ(result, "failed 179");
     EXPECT_EQ(oxtest::readFile(csv).size(), 4096u);
+#endif
 }
 
 TEST_F(FaultTest, FullDeviceUnderTheDocumentWriters) {
@@ -200,16 +204,28 @@ TEST_F(FaultTest, FileThatShrinksWhileItIsRead) {
     EXPECT_EQ(in.read(value), 4); // what was left of the second value
     EXPECT_NE(numbers(), "");
     EXPECT_EQ(in.read(value), 0); // a failed stream stays failed
+    EXPECT_EQ(numbers(), "2,18,19");
 
     // The XML reader knows the length from the open; the file is shorter
-    // when it reads: it reports and answers OxFalse, with no crash.
+    // when it reads: it reads the lines that are still there, the last one
+    // cut, as a line reader would, with no crash and no report.
     const std::string doc = dir.file("shrinking.xml");
     std::string text = bigDocument(50);
     oxtest::writeFile(doc, text);
     OxXmlFile xml(doc.c_str(), OxFile::OxIOInput);
     fs::resize_file(doc, text.size() / 2);
-    EXPECT_EQ(xml.readFile(), OxFalse);
-    EXPECT_NE(numbers(), "");
+    EXPECT_EQ(xml.readFile(), OxTrue);
+    ASSERT_NE(xml.getRoot(), nullptr);
+    // A part whose tag name is whole on the line that is left is an element.
+    std::string kept = text.substr(0, text.size() / 2);
+    unsigned int tags = 0;
+    for (size_t at = kept.find("<part "); at != std::string::npos;
+         at = kept.find("<part ", at + 1)) {
+        tags++;
+    }
+    EXPECT_GT(tags, 20u);
+    EXPECT_EQ(xml.getRoot()->getNbChildElements(), tags);
+    EXPECT_EQ(numbers(), "");
 
     // The CSV reader reads the lines that are still there.
     const std::string table = dir.file("shrinking.csv");
@@ -221,8 +237,9 @@ TEST_F(FaultTest, FileThatShrinksWhileItIsRead) {
 }
 
 TEST_F(FaultTest, NothingButRegularFilesIsRead) {
+#ifndef _WIN32
     // A FIFO without a writer would block an open forever: every reader
-    // refuses it at once, as it refuses a directory.
+    // refuses it at once, as it refuses a directory. (FIFOs are POSIX's.)
     const std::string fifo = dir.file("fifo");
     ASSERT_EQ(mkfifo(fifo.c_str(), 0600), 0);
     OxInput in(fifo.c_str(), OxFile::FILE_MODE_BINARY);
@@ -238,13 +255,18 @@ TEST_F(FaultTest, NothingButRegularFilesIsRead) {
     EXPECT_EQ(list.readListFiles(), OxFalse);
     EXPECT_EQ(testing::internal::GetCapturedStderr(),
               "Unable to open list file.\n  Tried " + fifo + "\n");
+#endif
 
     // A message file planted as a directory or a FIFO in the working
     // directory is passed over for the one in the application's directory.
     oxtest::TempDir work, app;
     fs::create_directory(work.file("app.msg"));
     oxtest::writeFile(app.file("app.msg"), "7,I,0from the application\n");
+#ifdef _WIN32
+    fs::create_directory(work.file("pipe.msg")); // no FIFO: a directory again
+#else
     ASSERT_EQ(mkfifo(work.file("pipe.msg").c_str(), 0600), 0);
+#endif
     oxtest::writeFile(app.file("pipe.msg"), "7,I,0past the pipe\n");
     fs::path home = fs::current_path();
     fs::current_path(work.path());
@@ -263,6 +285,9 @@ TEST_F(FaultTest, NothingButRegularFilesIsRead) {
 }
 
 TEST_F(FaultTest, ReadOnlyOutputDirectory) {
+#ifdef _WIN32
+    GTEST_SKIP() << "permission bits of a directory and dropping root rights are POSIX's";
+#else
     const std::string locked = dir.file("locked");
     fs::create_directory(locked);
     oxtest::writeFile(locked + "/old.xml", "<old/>\n");
@@ -282,13 +307,14 @@ TEST_F(FaultTest, ReadOnlyOutputDirectory) {
     chmod(locked.c_str(), 0755);
     EXPECT_EQ(result, "refused kept 1,19,182");
     EXPECT_EQ(oxtest::readFile(locked + "/old.xml"), "<old/>\n"); // nothing destroyed
+#endif
 }
 
 TEST(OxFaultWalk, DirectoryRemovedDuringAWalk) {
     oxtest::TempDir tmp;
     for (const char* sub : {"a", "b", "c"}) {
-        fs::create_directories(tmp.file(sub) + "/deep/deeper");
-        oxtest::writeFile(tmp.file(sub) + "/deep/deeper/f.txt", "x");
+        fs::create_directories(tmp.file(std::string(sub) + "/deep/deeper"));
+        oxtest::writeFile(tmp.file(std::string(sub) + "/deep/deeper/f.txt"), "x");
     }
     struct Seen {
         std::string root;
@@ -302,8 +328,8 @@ TEST(OxFaultWalk, DirectoryRemovedDuringAWalk) {
         if (!s.removed && s.paths.size() == 2) {
             // The first subdirectory met: both others go while the walk runs.
             for (const char* sub : {"a", "b", "c"}) {
-                if (s.paths[1] != s.root + "/" + sub) {
-                    fs::remove_all(s.root + "/" + sub);
+                if (s.paths[1] != s.root + oxtest::kSep + sub) {
+                    fs::remove_all(s.root + oxtest::kSep + sub);
                 }
             }
             s.removed = true;
@@ -320,12 +346,10 @@ TEST(OxFaultWalk, DirectoryRemovedDuringAWalk) {
         // The root, the one subdirectory left and its three entries.
         EXPECT_EQ(seen.paths.size(), 5u) << slots;
         for (const char* sub : {"a", "b", "c"}) {
-            fs::create_directories(tmp.file(sub) + "/deep/deeper");
-            oxtest::writeFile(tmp.file(sub) + "/deep/deeper/f.txt", "x");
+            fs::create_directories(tmp.file(std::string(sub) + "/deep/deeper"));
+            oxtest::writeFile(tmp.file(std::string(sub) + "/deep/deeper/f.txt"), "x");
         }
     }
 }
-
-#endif
 
 } // namespace

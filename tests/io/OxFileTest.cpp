@@ -3,8 +3,13 @@
 
 #include <gtest/gtest.h>
 
+#include <cctype>
 #include <filesystem>
 #include <string>
+
+#ifdef _WIN32
+#include <direct.h>
+#endif
 
 using oxiotest::IoTest;
 using oxiotest::Numbers;
@@ -103,22 +108,47 @@ TEST(OxFilePathText, LevelsExtensionsAndSpecs) {
 }
 
 TEST(OxFilePathText, AbsolutePathsAndComparison) {
-    // Rooted paths stay as they are; without drives "\" stays "\".
+    // Rooted paths stay as they are, except "\" alone, which gets the current
+    // drive where there are drives; without drives "\" stays "\".
     EXPECT_EQ(take(OxFile::getAbsolutePath(R"(\dir\file)")), R"(\dir\file)");
-    EXPECT_EQ(take(OxFile::getAbsolutePath(R"(\)")), R"(\)");
     EXPECT_EQ(take(OxFile::getAbsolutePath(R"(c:\x\..\y)")), R"(c:\x\..\y)");
-    // Relative paths go behind the working directory and one backslash; a
-    // drive prefix is dropped, nothing is resolved.
+    // Relative paths go behind the working directory and one backslash,
+    // nothing is resolved.
     EXPECT_EQ(take(OxFile::getAbsolutePath(R"(a\..\b)")), cwd() + R"(\a\..\b)");
-    EXPECT_EQ(take(OxFile::getAbsolutePath("c:x")), cwd() + R"(\x)");
     EXPECT_EQ(take(OxFile::getAbsolutePath("")), cwd() + R"(\)");
 
     EXPECT_EQ(OxFile::compareFileSpecs(R"(c:\x)", R"(C:\x)"), OxTrue);
     EXPECT_EQ(OxFile::compareFileSpecs(R"(C:\X)", R"(C:\x)"), OxFalse);
     EXPECT_EQ(OxFile::compareFileSpecs("same", "same"), OxTrue);
-    // Without drives, a drive prefix names the one working directory.
-    EXPECT_EQ(OxFile::compareFileSpecs("part", "c:part"), OxTrue);
     EXPECT_EQ(OxFile::compareFileSpecs("part", "Part"), OxFalse);
+#ifdef _WIN32
+    // The drive of the working directory (Z: under Wine) and drive C, whose
+    // own working directory is asked of the runtime.
+    const std::string drive = std::string(1, static_cast<char>(std::toupper(cwd()[0]))) + ":";
+    ASSERT_EQ(cwd()[1], ':');
+    EXPECT_EQ(take(OxFile::getAbsolutePath(R"(\)")), drive + R"(\)");
+    char driveC[300];
+    ASSERT_NE(_getdcwd(3, driveC, sizeof driveC), nullptr);
+    std::string cwdC = driveC;
+    std::string behindC = cwdC.back() == '\\' ? cwdC : cwdC + R"(\)";
+    EXPECT_EQ(take(OxFile::getAbsolutePath("c:x")), behindC + "x");
+    EXPECT_EQ(take(OxFile::getCWD(nullptr, 0, 3)), cwdC);
+    // A drive prefix names that drive's working directory; the drive letter
+    // alone is upper-cased in the comparison.
+    EXPECT_EQ(OxFile::compareFileSpecs("part", (drive + "part").c_str()), OxTrue);
+    std::string lowerDrive = drive;
+    lowerDrive[0] = static_cast<char>(std::tolower(lowerDrive[0]));
+    EXPECT_EQ(OxFile::compareFileSpecs("part", (lowerDrive + "part").c_str()), OxTrue);
+    if (drive != "C:") {
+        EXPECT_EQ(OxFile::compareFileSpecs("part", "c:part"), OxFalse);
+    }
+#else
+    EXPECT_EQ(take(OxFile::getAbsolutePath(R"(\)")), R"(\)");
+    // Without drives a drive prefix is dropped: it names the one working
+    // directory.
+    EXPECT_EQ(take(OxFile::getAbsolutePath("c:x")), cwd() + R"(\x)");
+    EXPECT_EQ(OxFile::compareFileSpecs("part", "c:part"), OxTrue);
+#endif
 
     char* here = OxFile::getCWD(nullptr, 0, 0);
     EXPECT_EQ(take(here), cwd());

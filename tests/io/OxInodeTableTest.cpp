@@ -48,7 +48,12 @@ TEST(OxInodeTableTest, AddAndExistsAnswers) {
     EXPECT_EQ(device.exists(&other), OxFalse);
     EXPECT_EQ(device.getCount(), 0u);
 
-    // Numbers beyond 32 bits stay apart from their low halves.
+    // Numbers beyond 32 bits stay apart from their low halves, where the
+    // status record holds such numbers (Windows keeps a 16-bit inode and a
+    // 32-bit device number).
+    if (sizeof(zero.st_ino) < 8 || sizeof(zero.st_dev) < 8) {
+        return;
+    }
     OxStat wide = statusOf(0x100000005ull, (1ull << 40) + 77);
     EXPECT_EQ(table.add(&wide), OxTrue);
     EXPECT_EQ(table.exists(&wide), OxTrue);

@@ -191,7 +191,11 @@ TEST_F(IoTest, CharacterRecordsAndLines) {
     EXPECT_EQ(lines.getFileLength(), 20); // bytes, even in text mode
     char line[5];
     EXPECT_EQ(lines.getline(line, sizeof line, '\n'), OxTrue);
+#ifdef _WIN32
+    EXPECT_STREQ(line, "one"); // text mode reads CR LF as "\n"
+#else
     EXPECT_STREQ(line, "one\r");
+#endif
     EXPECT_EQ(lines.getline(line, sizeof line, '\n'), OxFalse);
     EXPECT_STREQ(line, "0123");
     EXPECT_EQ(lines.eof(), OxFalse);
@@ -321,7 +325,8 @@ TEST_F(IoTest, OutputPreparesItsDirectory) {
         EXPECT_EQ(out.putline("new"), OxTrue);
         EXPECT_EQ(out.putline(static_cast<const char*>(nullptr)), OxTrue);
         EXPECT_EQ(out.putline(""), OxTrue);
-        EXPECT_EQ(oxtest::readFile(dir.file("made/old.txt")), "new\n\n"); // flushed per line
+        // flushed per line
+        EXPECT_EQ(oxtest::readFile(dir.file("made/old.txt")), oxtest::textBytes("new\n\n"));
     }
     EXPECT_EQ(oxtest::readFile(dir.file("made/link.txt")), "old");
     // Without a separator nothing is removed: the truncation empties the file.
@@ -332,7 +337,7 @@ TEST_F(IoTest, OutputPreparesItsDirectory) {
         EXPECT_EQ(out.isGood(), OxTrue);
     }
     std::filesystem::current_path(home);
-    EXPECT_EQ(oxtest::readFile(dir.file("made/old.txt")), "new\n\n");
+    EXPECT_EQ(oxtest::readFile(dir.file("made/old.txt")), oxtest::textBytes("new\n\n"));
     EXPECT_EQ(oxtest::readFile(dir.file("made/link.txt")), "");
     EXPECT_EQ(taken(), Numbers{});
 }
@@ -366,8 +371,10 @@ TEST_F(IoTest, OutputSeekAndFailedState) {
     EXPECT_EQ(full.isGood(), OxFalse);
 }
 
-#ifndef _WIN32
 TEST_F(IoTest, OutputKeepsDevicesFifosAndLinkTargets) {
+#ifdef _WIN32
+    GTEST_SKIP() << "/dev/null, FIFOs and symbolic links are POSIX's";
+#else
     struct stat status {};
     {
         OxOutput null("/dev/null", kBinary); // a directory part: the old file would go
@@ -405,6 +412,7 @@ TEST_F(IoTest, OutputKeepsDevicesFifosAndLinkTargets) {
     EXPECT_FALSE(std::filesystem::is_symlink(dir.file("link.txt")));
     EXPECT_EQ(oxtest::readFile(dir.file("link.txt")), "new\n");
     EXPECT_EQ(taken(), Numbers{});
+#endif
 }
 
 TEST_F(IoTest, BufferedValuesReachTheFileOrTheirLossIsReported) {
@@ -422,7 +430,12 @@ TEST_F(IoTest, BufferedValuesReachTheFileOrTheirLossIsReported) {
     }
     EXPECT_EQ(oxtest::readFile(path), bytes({0, 0, 0, 1, 0, 2}));
     EXPECT_EQ(taken(), (Numbers{"179", "179"}));
+}
 
+TEST_F(IoTest, LossOfBufferedValuesIsReported) {
+    if (!std::filesystem::exists("/dev/full")) {
+        GTEST_SKIP() << "no /dev/full to fail writes";
+    }
     // Values wait in the buffer and report success; the flush tells.
     {
         OxOutput full("/dev/full", kBinary);
@@ -439,4 +452,3 @@ TEST_F(IoTest, BufferedValuesReachTheFileOrTheirLossIsReported) {
     } // a clean stream whose final close fails names the file
     EXPECT_EQ(log.take(), std::vector<std::string>{"m183 /dev/full"});
 }
-#endif

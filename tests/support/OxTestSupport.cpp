@@ -49,8 +49,17 @@ TempDir::~TempDir() {
     std::filesystem::remove_all(dir, error);
 }
 
+std::string native(std::string path) {
+    for (char& c : path) {
+        if (c == '/') {
+            c = kSep;
+        }
+    }
+    return path;
+}
+
 std::string TempDir::file(const std::string& name) const {
-    return dir + "/" + name;
+    return dir + kSep + native(name);
 }
 
 std::string readFile(const std::string& path) {
@@ -60,13 +69,49 @@ std::string readFile(const std::string& path) {
     return bytes.str();
 }
 
+std::string readText(const std::string& path) {
+    std::string bytes = readFile(path);
+#ifdef _WIN32
+    std::string text;
+    text.reserve(bytes.size());
+    for (size_t i = 0; i < bytes.size(); i++) {
+        if (bytes[i] == '\r' && i + 1 < bytes.size() && bytes[i + 1] == '\n') {
+            continue; // the '\n' follows
+        }
+        if (bytes[i] == '\n' && (i == 0 || bytes[i - 1] != '\r')) {
+            text += "<LF without CR>";
+        }
+        text += bytes[i];
+    }
+    return text;
+#else
+    return bytes;
+#endif
+}
+
+std::string textBytes(const std::string& text) {
+#ifdef _WIN32
+    std::string bytes;
+    bytes.reserve(text.size() + text.size() / 8);
+    for (char c : text) {
+        if (c == '\n') {
+            bytes += '\r';
+        }
+        bytes += c;
+    }
+    return bytes;
+#else
+    return text;
+#endif
+}
+
 void writeFile(const std::string& path, const std::string& bytes) {
     std::ofstream out(path, std::ios::binary | std::ios::trunc);
     out.write(bytes.data(), static_cast<std::streamsize>(bytes.size()));
 }
 
 std::string dataFile(const std::string& name) {
-    return std::string(OXBASE_DATA_DIR) + "/" + name;
+    return native(std::string(OXBASE_DATA_DIR) + "/" + name);
 }
 
 std::string streamText(std::ostrstream& stream) {

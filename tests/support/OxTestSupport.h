@@ -14,6 +14,17 @@ class OxMsg;
 
 namespace oxtest {
 
+/// The separator the library writes on this platform: '\\' on Windows, '/'
+/// elsewhere.
+#ifdef _WIN32
+constexpr char kSep = '\\';
+#else
+constexpr char kSep = '/';
+#endif
+/// `path` with every '/' turned into the platform's separator, so that a
+/// test spells its paths once for both platforms.
+std::string native(std::string path);
+
 /// A fresh directory under the system's temporary directory, removed with
 /// everything in it when the object goes.
 class TempDir {
@@ -24,7 +35,8 @@ public:
     TempDir& operator=(const TempDir&) = delete;
 
     const std::string& path() const { return dir; }
-    /// `path()` + "/" + `name`.
+    /// `path()`, the platform's separator and `name` (its '/' turned into
+    /// that separator too).
     std::string file(const std::string& name) const;
 
 private:
@@ -33,6 +45,14 @@ private:
 
 /// The whole content of a file as bytes; empty when it cannot be read.
 std::string readFile(const std::string& path);
+/// The content of a file that the library wrote in text mode, with the
+/// platform's line end read as "\n": CR LF on Windows, where a bare LF
+/// comes out as "<LF without CR>\n" so that a comparison shows it; the bytes
+/// as they are elsewhere.
+std::string readText(const std::string& path);
+/// The bytes that text mode writes for `text` on this platform: each "\n"
+/// as CR LF on Windows, unchanged elsewhere.
+std::string textBytes(const std::string& text);
 /// Writes `bytes` to `path`, replacing the file.
 void writeFile(const std::string& path, const std::string& bytes);
 /// A file of the bundled data directory.

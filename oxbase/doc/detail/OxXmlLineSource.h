@@ -1,5 +1,8 @@
 // OxXmlLineSource.h: the lines of a text-mode input, whole, for the XML reader.
 //
+// The length measured at the open is the most that is read; the text may
+// end sooner (CR LF read as "\n" on Windows). A line end of CR LF is left to
+// the reader's trimming, so CR LF and LF files read the same everywhere.
 // Without memory std::bad_alloc reaches the reader's caller (readFile).
 //
 //   OxXmlLineSource source(input);
@@ -93,12 +96,19 @@ private:
         if (want > kMaximumRead) {
             want = kMaximumRead;
         }
-        long long got = input.read(buffer + filled, static_cast<unsigned int>(want));
-        if (got != static_cast<long long>(want)) {
-            return ReadFailure; // reported by the input (2 or 3 and the state)
+        long long got = input.readText(buffer + filled, static_cast<unsigned int>(want));
+        if (got < static_cast<long long>(want)) {
+            if (input.eof() != OxTrue) {
+                return ReadFailure; // reported by the input (2 and the state)
+            }
+            // The text ends before the length measured at the open: text
+            // mode on Windows reads each CR LF as one character, and a file
+            // that shrank meanwhile ends where its bytes end.
+            remaining = 0;
+        } else {
+            remaining -= got;
         }
-        filled += want;
-        remaining -= static_cast<long long>(want);
+        filled += static_cast<size_t>(got);
         return Line;
     }
 

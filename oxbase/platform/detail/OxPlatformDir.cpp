@@ -5,7 +5,6 @@
 
 #include <cctype>
 #include <cerrno>
-#include <cstring>
 #include <new>
 
 #ifdef _WIN32
@@ -160,13 +159,6 @@ bool OxPlatformMakeAbsolute(const char* path, std::string& out) {
         out.clear();
         return false;
     }
-#ifdef _WIN32
-    if (std::strlen(path) >= 3 && std::isalpha(static_cast<unsigned char>(path[0])) &&
-        path[1] == ':' && OxPlatformIsSeparator(path[2])) {
-        out = path;
-        return true;
-    }
-#endif
     if (OxPlatformIsAbsolute(path)) {
         out = path;
         return true;

@@ -3,7 +3,10 @@
 // A find handle lists the entries of one directory, "." and ".." included,
 // in the order the platform gives them. The pattern is the directory followed
 // by "*" (as the Windows find calls want it); on POSIX the "*" is dropped and
-// the directory is read with opendir/readdir.
+// the directory is read with opendir/readdir. On Windows the runtime's
+// _findfirst64i32, _findnext64i32 and _findclose list it; MinGW-w64's
+// runtime has no _findfirst64i32/_findnext64i32 of its own, its <io.h> makes
+// them inline functions over _findfirst64/_findnext64, which are used so.
 //
 //   const char * name = nullptr;
 //   OxPlatformFindHandle * handle = OxPlatformFindFirst("/data/*", &name);

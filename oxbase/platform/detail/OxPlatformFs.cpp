@@ -9,7 +9,9 @@
 #ifdef _WIN32
 #include <direct.h>
 #include <io.h>
+#ifdef _MSC_VER
 #include <share.h>
+#endif
 #else
 #include <unistd.h>
 #endif
@@ -179,8 +181,12 @@ std::ifstream* OxPlatformOpenInput(const char* path, bool binary) {
         refused->setstate(std::ios_base::failbit);
         return refused;
     }
-#ifdef _WIN32
+#if defined(_MSC_VER)
     return new std::ifstream(path != nullptr ? path : "", mode, _SH_DENYNO);
+#elif defined(_WIN32)
+    // libstdc++ (MinGW) opens through the runtime's fopen, which shares the
+    // file for reading and writing (_SH_DENYNO) on its own.
+    return new std::ifstream(path != nullptr ? path : "", mode);
 #else
     // POSIX opens never lock other processes out.
     return new std::ifstream(OxPlatformNativePath(path), mode);
@@ -192,8 +198,10 @@ std::ofstream* OxPlatformOpenOutput(const char* path, bool binary) {
     if (binary) {
         mode |= std::ios_base::binary;
     }
-#ifdef _WIN32
+#if defined(_MSC_VER)
     return new std::ofstream(path != nullptr ? path : "", mode, _SH_DENYNO);
+#elif defined(_WIN32)
+    return new std::ofstream(path != nullptr ? path : "", mode);
 #else
     return new std::ofstream(OxPlatformNativePath(path), mode);
 #endif

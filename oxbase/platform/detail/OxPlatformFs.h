@@ -6,6 +6,15 @@
 // backslash is handed to the operating system as '/'. Functions that answer
 // an int follow the C convention (0 success, -1 failure with errno set).
 //
+// Windows: the runtime's _stat64i32, _mkdir, _unlink, remove, _chdir,
+// _getdcwd and _getdrive. MinGW-w64's runtime (msvcrt.dll) has no
+// _stat64i32 of its own: its <sys/stat.h> makes it an inline function over
+// _stat64 that narrows the size, which is what is called here. Its C++
+// library has no stream constructor with a share mode (MSVC's
+// `ifstream(name, mode, _SH_DENYNO)`); its streams open through fopen, which
+// shares the file for reading and writing just the same. The record has no
+// inode numbers (st_ino is 0) and its device number is the drive (0 is A).
+//
 //   OxStat status;
 //   if (OxPlatformStat("data\\parts", &status) == 0 && OxPlatformIsDirectoryMode(status)) { ... }
 //   std::ifstream * in = OxPlatformOpenInput("data\\parts\\a.bin", true);

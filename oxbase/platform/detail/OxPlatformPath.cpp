@@ -1,5 +1,6 @@
 #include "oxbase/platform/detail/OxPlatformPath.h"
 
+#include <cctype>
 #include <cerrno>
 #include <vector>
 
@@ -29,7 +30,16 @@ bool OxPlatformIsSeparator(char c) {
 }
 
 bool OxPlatformIsAbsolute(const char* path) {
-    return path != nullptr && OxPlatformIsSeparator(path[0]);
+    if (path == nullptr) {
+        return false;
+    }
+#ifdef _WIN32
+    // Rooted as the path rules say: "c:\..." with a drive, "\..." without.
+    if (std::isalpha(static_cast<unsigned char>(path[0])) && path[1] == ':') {
+        return OxPlatformIsSeparator(path[2]);
+    }
+#endif
+    return OxPlatformIsSeparator(path[0]);
 }
 
 std::string OxPlatformNativePath(const char* path) {

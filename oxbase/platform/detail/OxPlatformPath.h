@@ -21,7 +21,9 @@ namespace detail {
 char OxPlatformSeparator();
 /// Whether `c` separates path components: '/' and '\\' on POSIX, '\\' on Windows.
 bool OxPlatformIsSeparator(char c);
-/// Whether `path` begins with a separator (a drive letter counts as relative).
+/// Whether `path` is absolute: it begins with a separator, or on Windows with
+/// a drive and a separator ("c:\\x"; "c:x" is relative to the drive's own
+/// working directory and so not absolute).
 bool OxPlatformIsAbsolute(const char* path);
 /// `path` as the operating system wants it spelled; empty for a null path.
 std::string OxPlatformNativePath(const char* path);

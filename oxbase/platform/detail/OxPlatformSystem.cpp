@@ -31,8 +31,11 @@ int OxPlatformOperatingSystem() {
 
 // ---------------------------------------------------------------------------
 // Checked copies: the failure rule of strcpy_s and its kin, on every platform.
-// They are written out rather than calling the Windows runtime's `_s` forms,
-// whose default handler of an invalid parameter ends the process.
+// Every argument that the Windows runtime would hand to its invalid-parameter
+// handler (a null pointer, a text that does not fit) is refused here first,
+// with the result the runtime gives, because the Microsoft runtime's default
+// handler ends the process. What passes is copied by the runtime's `_s` call
+// on Windows and by memmove elsewhere.
 
 namespace {
 // The length of `text`, looking at no more than `limit` bytes.
@@ -58,8 +61,12 @@ int OxPlatformStrcpy(char* target, size_t size, const char* text) {
         target[0] = '\0';
         return ERANGE;
     }
+#ifdef _WIN32
+    return strcpy_s(target, size, text);
+#else
     std::memmove(target, text, length + 1);
     return 0;
+#endif
 }
 
 int OxPlatformStrcat(char* target, size_t size, const char* text) {
@@ -80,8 +87,12 @@ int OxPlatformStrcat(char* target, size_t size, const char* text) {
         target[0] = '\0';
         return ERANGE;
     }
+#ifdef _WIN32
+    return strcat_s(target, size, text);
+#else
     std::memmove(target + used, text, length + 1);
     return 0;
+#endif
 }
 
 int OxPlatformStrncpy(char* target, size_t size, const char* text, size_t count) {
@@ -97,12 +108,19 @@ int OxPlatformStrncpy(char* target, size_t size, const char* text, size_t count)
         target[0] = '\0';
         return ERANGE;
     }
+#ifdef _WIN32
+    return strncpy_s(target, size, text, length);
+#else
     std::memmove(target, text, length);
     target[length] = '\0';
     return 0;
+#endif
 }
 
-// vsnprintf is the C99 form on both platforms; a truncated text counts as a failure.
+// A text that does not fit is a failure, as in vsprintf_s. On Windows the
+// runtime's _vscprintf measures the text first (on a copy of the arguments,
+// in the runtime's own dialect of printf), so that vsprintf_s only ever gets
+// a text that fits; elsewhere C99's vsnprintf does both at once.
 int OxPlatformVsprintf(char* buffer, size_t size, const char* format, va_list arguments) {
     if (buffer == nullptr || size == 0) {
         return -1;
@@ -111,7 +129,19 @@ int OxPlatformVsprintf(char* buffer, size_t size, const char* format, va_list ar
         buffer[0] = '\0';
         return -1;
     }
+#ifdef _WIN32
+    va_list measure;
+    va_copy(measure, arguments);
+    int needed = _vscprintf(format, measure);
+    va_end(measure);
+    if (needed < 0 || static_cast<size_t>(needed) >= size) {
+        buffer[0] = '\0';
+        return -1;
+    }
+    int written = vsprintf_s(buffer, size, format, arguments);
+#else
     int written = std::vsnprintf(buffer, size, format, arguments);
+#endif
     if (written < 0 || static_cast<size_t>(written) >= size) {
         buffer[0] = '\0';
         return -1;
@@ -139,7 +169,17 @@ bool inRange(int value, int low, int high) {
     return value >= low && value <= high;
 }
 
-#ifndef _WIN32
+#ifdef _WIN32
+// The room that asctime_s and ctime_s want: 24 characters, "\n" and NUL.
+constexpr size_t kAsctimeSize = 26;
+
+// The times that the runtime's 64-bit time calls take: from 1970-01-01
+// 00:00:00 to 3000-12-31 23:59:59 UTC (_MAX__TIME64_T); a time outside would
+// reach the invalid-parameter handler.
+bool inTime64Range(long long time) {
+    return time >= 0 && time <= 32535215999LL;
+}
+#else
 // The time_t of a 64-bit count of seconds, when it has one.
 bool toTimeT(long long time, time_t* result) {
     if (static_cast<long double>(time) >
@@ -182,6 +222,17 @@ int OxPlatformAsctime(char* buffer, size_t size, const tm* time) {
         !inRange(time->tm_min, 0, 59) || !inRange(time->tm_sec, 0, 60)) {
         return EINVAL;
     }
+#ifdef _WIN32
+    // asctime_s takes the years 1900 to 9999 and no leap second; anything
+    // else would reach the runtime's invalid-parameter handler.
+    if (!inRange(time->tm_year, 0, 8099) || time->tm_sec > 59) {
+        return EINVAL;
+    }
+    if (size < kAsctimeSize) {
+        return ERANGE;
+    }
+    return asctime_s(buffer, size, time);
+#else
     long long year = static_cast<long long>(time->tm_year) + 1900;
     int written = std::snprintf(buffer, size, "%.3s %.3s%3d %.2d:%.2d:%.2d %lld\n",
                                 kDays[time->tm_wday], kMonths[time->tm_mon], time->tm_mday,
@@ -191,6 +242,7 @@ int OxPlatformAsctime(char* buffer, size_t size, const tm* time) {
         return ERANGE;
     }
     return 0;
+#endif
 }
 
 int OxPlatformGmtime(tm* result, long long time) {
@@ -198,6 +250,9 @@ int OxPlatformGmtime(tm* result, long long time) {
         return EINVAL;
     }
 #ifdef _WIN32
+    if (!inTime64Range(time)) {
+        return EINVAL;
+    }
     __time64_t value = time;
     return _gmtime64_s(result, &value);
 #else
@@ -214,6 +269,9 @@ int OxPlatformLocaltime(tm* result, long long time) {
         return EINVAL;
     }
 #ifdef _WIN32
+    if (!inTime64Range(time)) {
+        return EINVAL;
+    }
     __time64_t value = time;
     return _localtime64_s(result, &value);
 #else
@@ -230,6 +288,13 @@ int OxPlatformCtime(char* buffer, size_t size, long long time) {
         return EINVAL;
     }
 #ifdef _WIN32
+    buffer[0] = '\0';
+    if (!inTime64Range(time)) {
+        return EINVAL;
+    }
+    if (size < kAsctimeSize) {
+        return ERANGE;
+    }
     __time64_t value = time;
     return _ctime64_s(buffer, size, &value);
 #else
@@ -260,7 +325,18 @@ int OxPlatformGetenv(size_t* required, char* buffer, size_t size, const char* na
         return EINVAL;
     }
 #ifdef _WIN32
-    return getenv_s(required, buffer, size, name);
+    // getenv_s of Microsoft's runtime answers 0 with a required size of 0 for
+    // a variable that is not set, and 0 with the size for a query without a
+    // buffer. Other builds of msvcrt.dll (Wine's) answer EINVAL and ERANGE
+    // there: with the size taken from *required both come out the same.
+    int result = getenv_s(required, buffer, size, name);
+    if (*required == 0) {
+        return 0; // not set
+    }
+    if (buffer == nullptr && result == ERANGE) {
+        return 0; // the size alone was asked for
+    }
+    return result;
 #else
     *required = 0;
     if (buffer != nullptr) {

@@ -1,11 +1,25 @@
 // OxPlatformSystem.h: the runtime and operating-system services behind OxSystem.
 //
 // Each function here is the checked form of one runtime call: the `_s` or
-// 64-bit call of the runtime on Windows, the reentrant call on POSIX, with
-// the same failure rule. The copies and the formatting follow that rule in
-// one portable implementation. Functions that answer an int return 0 on
-// success and an errno value (EINVAL, ERANGE, ...) on failure; a failed copy
-// leaves its target NUL-terminated and empty, as the checked runtime calls do.
+// 64-bit call of the runtime on Windows (strcpy_s, strcat_s, strncpy_s,
+// vsprintf_s, getenv_s, strerror_s, asctime_s, strtok_s, _ctime64_s,
+// _gmtime64_s, _localtime64_s), the reentrant call on POSIX, with the same
+// failure rule. Functions that answer an int return 0 on success and an
+// errno value (EINVAL, ERANGE, ...) on failure; a failed copy leaves its
+// target NUL-terminated and empty, as the checked runtime calls do.
+//
+// Windows: whatever would reach the runtime's invalid-parameter handler (a
+// null pointer, a text that does not fit, a time before 1970 or after the
+// year 3000, a year beyond 9999 for asctime_s) is refused here first with
+// the runtime's result, since the handler of Microsoft's runtime ends the
+// process by default. MinGW-w64 has every call: the ones msvcrt.dll lacks
+// on older systems (vsprintf_s, strerror_s, asctime_s and the 64-bit time
+// calls) come from its import library, which calls msvcrt.dll's own when it
+// is there. getenv_s of Wine's msvcrt.dll answers EINVAL for a variable that
+// is not set and ERANGE for a size query; both are read as Microsoft's
+// runtime answers them (0, with the size in `*required`). The computer name
+// comes from GetComputerNameW and is narrowed plainly: ASCII as it is, any
+// other character as '?'.
 //
 //   char name[64];
 //   if (OxPlatformStrcpy(name, sizeof name, text) != 0) { /* did not fit */ }
