@@ -6,6 +6,7 @@
 #include "oxbase/diag/OxPrt.h"
 #include "oxbase/doc/OxXmlFile.h"
 #include "oxbase/doc/detail/OxXmlNames.h"
+#include "oxbase/doc/detail/OxXmlPendingAttributes.h"
 #include "oxbase/geom/OxColor.h"
 #include "oxbase/geom/OxVec.h"
 
@@ -90,13 +91,12 @@ OxXmlElement::~OxXmlElement() {
     if ((storage & kStoredValue) == 0) {
         delete[] value;
     }
-    if (attributes != nullptr) {
+    // Pending attributes are texts of the store and go with it.
+    if ((storage & kPendingAttributes) == 0 && attributes != nullptr) {
         for (unsigned int i = 0; i < attributes->length; i++) {
             OxXmlAttribute::release(attributes->data[i]);
         }
-        if ((storage & kStoredAttributes) == 0) {
-            deleteList(attributes);
-        }
+        deleteList(attributes);
     }
     if (children == nullptr) {
         return;
@@ -138,33 +138,48 @@ void OxXmlElement::release(OxXmlElement* element) {
     }
 }
 
-void OxXmlElement::moveAttributesToHeap(unsigned int capacity) {
-    OxGList<OxXmlAttribute*>* list = newList<OxXmlAttribute*>(capacity);
-    for (unsigned int i = 0; i < attributes->length; i++) {
-        list->data[i] = attributes->data[i];
+void OxXmlElement::buildPendingAttributes() const {
+    // Every allocation comes first: a failure leaves the attributes pending
+    // and the pending form untouched (the CSV form is read only once).
+    unsigned int count = pending->count;
+    OxGList<OxXmlAttribute*>* list = newList<OxXmlAttribute*>(count);
+    unsigned int made = 0;
+    try {
+        for (; made < count; made++) {
+            list->data[made] = new OxXmlAttribute(static_cast<char const*>(nullptr));
+        }
+    } catch (const std::bad_alloc&) {
+        for (unsigned int i = 0; i < made; i++) {
+            delete list->data[i];
+        }
+        deleteList(list);
+        throw;
     }
-    list->length = attributes->length;
-    attributes = list; // the stored list stays with the store
-    storage &= static_cast<std::uint8_t>(~kStoredAttributes);
+    unsigned int next = 0;
+    pending->forEach([list, &next](char const* attributeName, char* attributeValue) {
+        OxXmlAttribute* attribute = list->data[next++];
+        attribute->name = OxXmlNames::share(attributeName);
+        attribute->value = attributeValue; // a text of the store
+        attribute->storage = OxXmlAttribute::kStoredValue;
+    });
+    list->length = count;
+    // The element is no const object (see the header): its list is made here.
+    auto* self = const_cast<OxXmlElement*>(this);
+    self->attributes = list;
+    self->storage &= static_cast<std::uint8_t>(~kPendingAttributes);
 }
 
 void OxXmlElement::addAttribute(OxXmlAttribute* attribute) {
-    if (attributes == nullptr) {
+    if (attributeList() == nullptr) {
         // Most elements carry one or two attributes: start with one slot.
         attributes = newList<OxXmlAttribute*>(1);
-    } else if ((storage & kStoredAttributes) != 0) {
-        moveAttributesToHeap(attributes->length * 2 + 1);
     }
     attributes->append(attribute);
 }
 
 void OxXmlElement::reserveAttributes(unsigned int count) {
-    if (attributes == nullptr) {
+    if (attributeList() == nullptr) {
         attributes = newList<OxXmlAttribute*>(count);
-    } else if ((storage & kStoredAttributes) != 0) {
-        if (count > attributes->length) {
-            moveAttributesToHeap(count);
-        }
     } else {
         attributes->reserve(count);
     }
@@ -208,6 +223,9 @@ OxBool OxXmlElement::deleteChildren(char const* childName) {
 }
 
 unsigned int OxXmlElement::getNbAttributes() const {
+    if ((storage & kPendingAttributes) != 0) {
+        return pending->count;
+    }
     return attributes != nullptr ? attributes->length : 0;
 }
 
@@ -216,10 +234,11 @@ unsigned int OxXmlElement::getNbChildElements() const {
 }
 
 OxXmlAttribute* OxXmlElement::getAttribute(unsigned int index) const {
-    if (attributes == nullptr || index >= attributes->length) {
+    OxGList<OxXmlAttribute*>* list = attributeList();
+    if (list == nullptr || index >= list->length) {
         return nullptr;
     }
-    return attributes->data[index];
+    return list->data[index];
 }
 
 OxXmlElement* OxXmlElement::getChild(unsigned int index) const {
@@ -230,11 +249,15 @@ OxXmlElement* OxXmlElement::getChild(unsigned int index) const {
 }
 
 OxXmlAttribute* OxXmlElement::getAttributeByName(char const* attributeName) const {
-    if (attributeName == nullptr || attributes == nullptr) {
+    if (attributeName == nullptr) {
         return nullptr;
     }
-    for (unsigned int i = 0; i < attributes->length; i++) {
-        OxXmlAttribute* attribute = attributes->data[i];
+    OxGList<OxXmlAttribute*>* list = attributeList();
+    if (list == nullptr) {
+        return nullptr;
+    }
+    for (unsigned int i = 0; i < list->length; i++) {
+        OxXmlAttribute* attribute = list->data[i];
         if (attribute != nullptr && sameText(attribute->getName(), attributeName)) {
             return attribute;
         }
@@ -415,6 +438,9 @@ OxBool OxXmlElement::getPoint(char const* attributeName, OxVec4d& point) const {
     return OxToBool(result >= 0);
 }
 void OxXmlElement::dumpNode(std::ostrstream& stream) const {
+    // Pending attributes are built before anything is written: without
+    // memory the stream gets no part of the node.
+    OxGList<OxXmlAttribute*>* list = attributeList();
     if (name != nullptr) {
         oxIndent(stream) << "XML Element: \"" << name << "\"";
         if (value != nullptr) {
@@ -427,10 +453,10 @@ void OxXmlElement::dumpNode(std::ostrstream& stream) const {
     if (xsiType != nullptr) {
         oxIndent(stream) << "xsi:type : " << xsiType << "\n";
     }
-    if (attributes != nullptr) {
+    if (list != nullptr) {
         OxPrt::adjustIndent(2);
-        for (unsigned int i = 0; i < attributes->length; i++) {
-            OxXmlAttribute* attribute = attributes->data[i];
+        for (unsigned int i = 0; i < list->length; i++) {
+            OxXmlAttribute* attribute = list->data[i];
             if (attribute != nullptr) {
                 oxIndent(stream) << "attribute[" << i << "]:\n";
                 attribute->dump(&stream);

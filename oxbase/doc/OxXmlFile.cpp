@@ -312,12 +312,17 @@ OxBool OxXmlFile::writeFile() {
     }
     OxBool result = OxFalse;
     std::unique_ptr<OxXmlLineSink> sink;
+    short indentBefore = curpos;
     if (!withMemory([&] {
             sink.reset(new OxXmlLineSink(*output, flushEveryLine != OxFalse));
             result = writeDocument(*sink);
         })) {
         reportNoMemory(); // the lines finished so far still go to the file
         result = OxFalse;
+        // The attributes of an element are built when it is written, so
+        // memory may run out deep in the tree: the indentation goes back to
+        // where the document began.
+        setIndent(indentBefore);
     }
     if (sink != nullptr) {
         sink->finish();

@@ -47,6 +47,7 @@ public:
                 line = buffer + lineStart;
                 length = static_cast<size_t>(found - line);
                 lineStart = scan = static_cast<size_t>(found - buffer) + 1;
+                passNul();
                 return Line;
             }
             scan = filled;
@@ -56,6 +57,7 @@ public:
                     line = buffer + lineStart;
                     length = filled - lineStart;
                     lineStart = scan = filled;
+                    passNul();
                     return Line;
                 }
                 return End;
@@ -67,8 +69,24 @@ public:
         }
     }
 
+    /// Whether the line last handed out may hold a NUL byte (no line
+    /// without one is ever said to).
+    bool lineMayHoldNul() const { return lastLineNul; }
+
 private:
+    static constexpr size_t kNone = static_cast<size_t>(-1);
     static constexpr size_t kInitialCapacity = 64 * 1024;
+
+    /// Notes whether the line that ends before `lineStart` holds the next
+    /// NUL byte, and finds the one behind it. Each byte is searched once.
+    void passNul() {
+        lastLineNul = nulAt < lineStart;
+        if (lastLineNul) {
+            auto* next =
+                static_cast<char*>(std::memchr(buffer + lineStart, '\0', filled - lineStart));
+            nulAt = next != nullptr ? static_cast<size_t>(next - buffer) : kNone;
+        }
+    }
     static constexpr size_t kMinimumRead = 16 * 1024;
     static constexpr size_t kMaximumRead = 1u << 30;
 
@@ -77,6 +95,9 @@ private:
             std::memmove(buffer, buffer + lineStart, filled - lineStart);
             filled -= lineStart;
             scan -= lineStart;
+            if (nulAt != kNone) {
+                nulAt -= lineStart;
+            }
             lineStart = 0;
         }
         if (capacity - 1 - filled < kMinimumRead) {
@@ -97,6 +118,10 @@ private:
         if (got != static_cast<long long>(want)) {
             return ReadFailure; // reported by the input (2 or 3 and the state)
         }
+        if (nulAt == kNone) {
+            auto* nul = static_cast<char*>(std::memchr(buffer + filled, '\0', want));
+            nulAt = nul != nullptr ? static_cast<size_t>(nul - buffer) : kNone;
+        }
         filled += want;
         remaining -= static_cast<long long>(want);
         return Line;
@@ -114,6 +139,8 @@ private:
     size_t filled = 0;
     size_t lineStart = 0;
     size_t scan = 0;
+    size_t nulAt = kNone; ///< the first NUL byte at or behind lineStart, if any
+    bool lastLineNul = false;
 };
 
 } // namespace detail

@@ -10,12 +10,34 @@
 #include "oxbase/io/OxInput.h"
 
 #include <cctype>
+#include <cstdint>
 #include <cstring>
 #include <iostream>
 #include <memory>
 
 namespace oxbase {
 namespace detail {
+
+namespace {
+/// What ends a name inside a tag, by character: kTagName a tag name (a blank,
+/// "/", ">"), kAttributeName an attribute name (those and "="). Both end at
+/// the NUL that the reader puts behind each line, so a scan needs no bound.
+enum : unsigned char { kTagName = 1, kAttributeName = 2 };
+struct NameEnds {
+    unsigned char of[256] = {};
+    constexpr NameEnds() {
+        of[static_cast<unsigned char>(' ')] = kTagName | kAttributeName;
+        of[static_cast<unsigned char>('/')] = kTagName | kAttributeName;
+        of[static_cast<unsigned char>('>')] = kTagName | kAttributeName;
+        of[0] = kTagName | kAttributeName;
+        of[static_cast<unsigned char>('=')] = kAttributeName;
+    }
+    bool ends(char c, unsigned char kind) const {
+        return (of[static_cast<unsigned char>(c)] & kind) != 0;
+    }
+};
+constexpr NameEnds kNameEnds;
+} // namespace
 
 OxXmlReader::NameCache::~NameCache() {
     for (Entry& entry : slots) {
@@ -28,31 +50,41 @@ char const* OxXmlReader::NameCache::lookup(char const* text, size_t length) {
     if (length == 0) {
         return nullptr;
     }
-    size_t slot = (length * 31 + static_cast<unsigned char>(text[0]) +
-                   static_cast<unsigned char>(text[length - 1]) * 7) %
-                  kSlots;
-    Entry& entry = slots[slot];
-    if (entry.raw != nullptr && entry.length == length &&
-        std::memcmp(entry.raw, text, length) == 0) {
-        return entry.shared;
+    // The length and three characters, mixed by one multiplication: enough
+    // to keep the names of a document apart, at a cost that does not grow
+    // with the name.
+    auto at = [text](size_t i) {
+        return static_cast<std::uint32_t>(static_cast<unsigned char>(text[i]));
+    };
+    std::uint32_t key = static_cast<std::uint32_t>(length) ^ (at(0) << 8) ^ (at(length / 2) << 16) ^
+                        (at(length - 1) << 24);
+    std::uint32_t hash = key * 2654435761u;
+    Entry& entry = slots[(hash >> 24) % kSlots];
+    if (entry.length == length && entry.raw != nullptr) {
+        // Names are short: a plain loop beats a library call.
+        size_t same = 0;
+        while (same < length && entry.raw[same] == text[same]) {
+            same++;
+        }
+        if (same == length) {
+            return entry.shared;
+        }
     }
     // A new name: its shared text and a copy of the raw text first, so that
     // the entry is replaced only when both are there.
     std::unique_ptr<char[]> raw(new char[length]);
     std::memcpy(raw.get(), text, length);
     char const* shared = OxXmlNames::acquire(text, length);
+    if (!withMemory([&] { store.holdName(shared); })) {
+        OxXmlNames::release(shared);
+        throw std::bad_alloc();
+    }
     delete[] entry.raw;
     OxXmlNames::release(entry.shared);
     entry.raw = raw.release();
     entry.length = length;
     entry.shared = shared;
     return shared;
-}
-
-OxXmlReader::~OxXmlReader() {
-    for (unsigned int i = 0; i < tagAttributes.length; i++) {
-        OxXmlStore::discard(tagAttributes.data[i]);
-    }
 }
 
 OxBool OxXmlReader::run() {
@@ -74,24 +106,23 @@ OxBool OxXmlReader::run() {
             break;
         }
         lineNumber++;
-        // A NUL byte cannot stand in a text: it is read as a blank.
-        unsigned int nuls = 0;
-        for (char* nul = static_cast<char*>(std::memchr(line, '\0', length)); nul != nullptr;
-             nul = static_cast<char*>(std::memchr(nul, '\0', length - (nul - line)))) {
-            *nul = ' ';
-            nuls++;
-        }
-        if (nuls > 0) {
-            OxMsg::Log(OxMsgXmlNulBytes, fileName(), lineNumber, nuls);
+        // A NUL byte cannot stand in a text: it is read as a blank. (The
+        // scanners below also rely on the NUL behind the line being the
+        // only one.)
+        if (source.lineMayHoldNul()) {
+            unsigned int nuls = 0;
+            for (char* nul = static_cast<char*>(std::memchr(line, '\0', length)); nul != nullptr;
+                 nul = static_cast<char*>(std::memchr(nul, '\0', length - (nul - line)))) {
+                *nul = ' ';
+                nuls++;
+            }
+            if (nuls > 0) {
+                OxMsg::Log(OxMsgXmlNulBytes, fileName(), lineNumber, nuls);
+            }
         }
         char* begin = line;
         char* end = line + length;
-        while (begin < end && OxXmlNames::isWhite(*begin)) {
-            begin++;
-        }
-        while (end > begin && OxXmlNames::isWhite(end[-1])) {
-            end--;
-        }
+        OxXmlNames::trim(begin, end);
         if (begin == end) {
             continue; // a blank line adds nothing in any state
         }
@@ -189,7 +220,7 @@ int OxXmlReader::doContent() {
         nameBegin++;
     }
     char* nameEnd = nameBegin;
-    while (nameEnd < lineEnd && *nameEnd != ' ' && *nameEnd != '/' && *nameEnd != '>') {
+    while (!kNameEnds.ends(*nameEnd, kTagName)) {
         nameEnd++;
     }
     if (nameEnd == lineEnd) {
@@ -244,8 +275,7 @@ int OxXmlReader::doElementValue() {
 int OxXmlReader::doAttribute() {
     skipBlanks();
     char* nameBegin = cursor;
-    while (cursor < lineEnd && *cursor != ' ' && *cursor != '/' && *cursor != '=' &&
-           *cursor != '>') {
+    while (!kNameEnds.ends(*cursor, kAttributeName)) {
         cursor++;
     }
     char* nameEnd = cursor;
@@ -266,19 +296,18 @@ int OxXmlReader::doAttribute() {
         state = CONTENT;
         return kGoOn;
     case '=':
-        attribute = nullptr;
+        attributeOpen = false;
         if (current != nullptr) {
             if (tagElement != current) {
                 commitAttributes();
                 tagElement = current;
             }
-            OxXmlAttribute* made = store.newAttributeShared(
-                names.lookup(nameBegin, static_cast<size_t>(nameEnd - nameBegin)));
-            if (!withMemory([&] { tagAttributes.append(made); })) {
-                OxXmlStore::discard(made);
-                throw std::bad_alloc();
-            }
-            attribute = made; // its element gets it at the tag's end; its value comes next
+            OxXmlPendingPair pair{names.lookup(nameBegin, static_cast<size_t>(nameEnd - nameBegin)),
+                                  nullptr};
+            tagPairs.append(pair);
+            // Its element gets it at the tag's end; its value comes next.
+            attribute = tagPairs.length - 1;
+            attributeOpen = true;
         }
         cursor++;
         state = ATTRIBUTE_VALUE;
@@ -304,9 +333,7 @@ int OxXmlReader::doAttributeValue() {
     quote = *cursor++;
     char* close = find(cursor, quote);
     if (close != nullptr) {
-        if (attribute != nullptr) {
-            store.setValue(attribute, cursor, static_cast<size_t>(close - cursor));
-        }
+        setAttributeValue(cursor, static_cast<size_t>(close - cursor));
         cursor = close + 1;
         state = ATTRIBUTE;
         return kGoOn;
@@ -341,9 +368,7 @@ int OxXmlReader::doAttributeValueMore() {
         return kAbort;
     }
     gathered.append(cursor, static_cast<size_t>(close - cursor));
-    if (attribute != nullptr) {
-        store.setValue(attribute, gathered.text(), gathered.size());
-    }
+    setAttributeValue(gathered.text(), gathered.size());
     gathered.clear();
     cursor = close + 1;
     state = ATTRIBUTE;
@@ -470,11 +495,12 @@ void OxXmlReader::attach(OxXmlElement* node) {
 }
 
 void OxXmlReader::commitAttributes() {
-    if (tagAttributes.length > 0 && tagElement != nullptr) {
-        store.addAttributes(tagElement, tagAttributes.data, tagAttributes.length);
+    if (tagPairs.length > 0 && tagElement != nullptr) {
+        store.setPendingPairs(tagElement, tagPairs.data, tagPairs.length);
     }
-    tagAttributes.length = 0;
+    tagPairs.length = 0;
     tagElement = nullptr;
+    attributeOpen = false;
 }
 
 void OxXmlReader::finishComment(bool cdata) {
@@ -494,8 +520,8 @@ void OxXmlReader::finishComment(bool cdata) {
 
 void OxXmlReader::finish() {
     // What stands open at the end keeps what was gathered.
-    if (gathering && gatheredValid && attribute != nullptr) {
-        store.setValue(attribute, gathered.text(), gathered.size());
+    if (gathering && gatheredValid) {
+        setAttributeValue(gathered.text(), gathered.size());
     }
     commitAttributes();
     if (commentOpen[0]) {

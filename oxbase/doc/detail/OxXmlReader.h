@@ -7,13 +7,13 @@
 
 #include "oxbase/doc/OxXmlFile.h"
 #include "oxbase/doc/detail/OxXmlLineSource.h"
+#include "oxbase/doc/detail/OxXmlPendingAttributes.h"
 #include "oxbase/doc/detail/OxXmlStore.h"
 #include "oxbase/doc/detail/OxXmlTextBuffer.h"
 
 #include <cstddef>
 #include <cstring>
 
-class OxXmlAttribute;
 class OxXmlElement;
 
 namespace oxbase {
@@ -46,7 +46,9 @@ class OxXmlReader {
     /// name; the cache gives them back at its end.
     class NameCache {
     public:
-        NameCache() = default;
+        /// Every name new to the cache is also held by `store`, for the
+        /// pending attributes that refer to it.
+        explicit NameCache(OxXmlStore& nameStore) : store(nameStore) {}
         NameCache(const NameCache&) = delete;
         NameCache& operator=(const NameCache&) = delete;
         ~NameCache();
@@ -60,7 +62,10 @@ class OxXmlReader {
             size_t length = 0;
             char const* shared = nullptr;
         };
-        static constexpr size_t kSlots = 64;
+        /// Slots by a hash of the whole raw text: the few dozen names of a
+        /// document rarely meet in one slot.
+        static constexpr size_t kSlots = 256;
+        OxXmlStore& store;
         Entry slots[kSlots];
     };
 
@@ -68,12 +73,10 @@ public:
     /// Reads into `document`, whose store must exist: elements, attributes
     /// and their values are built there.
     explicit OxXmlReader(OxXmlFile& document)
-        : file(document), store(*document.store), source(*document.input) {}
+        : file(document), store(*document.store), names(*document.store), source(*document.input) {}
     OxXmlReader(const OxXmlReader&) = delete;
     OxXmlReader& operator=(const OxXmlReader&) = delete;
-    /// Attributes not yet handed to their element (a read left by
-    /// std::bad_alloc) are destroyed.
-    ~OxXmlReader();
+    ~OxXmlReader() = default;
 
     OxBool run();
 
@@ -127,6 +130,12 @@ private:
     void attach(OxXmlElement* node);
     /// Hands the attributes of the tag in progress to their element.
     void commitAttributes();
+    /// Gives the attribute in progress the value [text, text + length).
+    void setAttributeValue(char const* text, size_t length) {
+        if (attributeOpen) {
+            tagPairs.data[attribute].value = store.copyValue(text, length);
+        }
+    }
     void finishComment(bool cdata);
     void finish();
     static char const* nameOrEmpty(char const* text) { return text != nullptr ? text : ""; }
@@ -150,12 +159,14 @@ private:
     // The DOCTYPE text: gathered over the whole read, stored at its end.
     bool doctypeLoaded = false;
     OxXmlTextBuffer doctypeText;
-    // The attributes of the tag in progress, handed to their element at the
-    // tag's end as one exact list.
+    // The attributes of the tag in progress (names and stored values),
+    // handed to their element at the tag's end as its pending attributes.
     OxXmlElement* tagElement = nullptr;
-    OxGList<OxXmlAttribute*> tagAttributes;
-    // The attribute in progress and its value gathered over several lines.
-    OxXmlAttribute* attribute = nullptr;
+    OxGList<OxXmlPendingPair> tagPairs;
+    // The attribute in progress (an entry of tagPairs) and its value
+    // gathered over several lines.
+    bool attributeOpen = false;
+    unsigned int attribute = 0;
     char quote = '"';
     bool gatheredValid = false;
     bool gathering = false;

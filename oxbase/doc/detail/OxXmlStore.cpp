@@ -3,6 +3,7 @@
 #include "oxbase/doc/OxXmlAttribute.h"
 #include "oxbase/doc/OxXmlElement.h"
 #include "oxbase/doc/detail/OxXmlNames.h"
+#include "oxbase/doc/detail/OxXmlPendingAttributes.h"
 
 #include <cctype>
 #include <cstdint>
@@ -21,19 +22,6 @@ constexpr std::size_t kLargestSlab = 60 * 1024;
 /// The slab header, rounded to the largest fundamental alignment.
 constexpr std::size_t kHeader = 16;
 
-bool isWhite(char c) {
-    return OxXmlNames::isWhite(c);
-}
-
-/// An attribute list that is an exact array in the store: the list object
-/// and its slots, one block.
-template <class T> OxGList<T>* storedList(void* memory, unsigned int count) {
-    auto* list = ::new (memory) OxGList<T>(0);
-    list->data = reinterpret_cast<T*>(static_cast<char*>(memory) + sizeof(OxGList<T>));
-    list->capacity = count;
-    list->length = 0;
-    return list;
-}
 } // namespace
 
 OxXmlStore::~OxXmlStore() {
@@ -41,6 +29,12 @@ OxXmlStore::~OxXmlStore() {
         Slab* next = slabs->next;
         delete[] reinterpret_cast<char*>(slabs);
         slabs = next;
+    }
+    for (unsigned int i = 0; i < names.length; i++) {
+        OxXmlNames::release(names.data[i]);
+    }
+    for (unsigned int i = 0; i < tables.length; i++) {
+        delete tables.data[i];
     }
 }
 
@@ -72,18 +66,13 @@ void* OxXmlStore::allocate(std::size_t size) {
     return block;
 }
 
-char* OxXmlStore::copyTrimmed(char const* text, std::size_t length) {
+char* OxXmlStore::copyValue(char const* text, std::size_t length) {
     if (length == 0) {
         return nullptr;
     }
     char const* first = text;
     char const* last = text + length;
-    while (first < last && isWhite(*first)) {
-        first++;
-    }
-    while (last > first && isWhite(last[-1])) {
-        last--;
-    }
+    OxXmlNames::trim(first, last);
     auto count = static_cast<std::size_t>(last - first);
     if (cursor == nullptr || static_cast<std::size_t>(end - cursor) < count + 1) {
         grow(count + 1);
@@ -112,34 +101,8 @@ OxXmlElement* OxXmlStore::newElementShared(char const* sharedName) {
     return element;
 }
 
-OxXmlAttribute* OxXmlStore::newAttribute(char const* name, std::size_t length) {
-    void* memory = allocate(sizeof(OxXmlAttribute));
-    char const* shared = OxXmlNames::acquire(name, length);
-    auto* attribute = ::new (memory) OxXmlAttribute(static_cast<char const*>(nullptr));
-    attribute->name = shared;
-    attribute->storage = OxXmlAttribute::kStoredNode;
-    return attribute;
-}
-
-OxXmlAttribute* OxXmlStore::newAttributeShared(char const* sharedName) {
-    void* memory = allocate(sizeof(OxXmlAttribute));
-    auto* attribute = ::new (memory) OxXmlAttribute(static_cast<char const*>(nullptr));
-    attribute->name = OxXmlNames::share(sharedName);
-    attribute->storage = OxXmlAttribute::kStoredNode;
-    return attribute;
-}
-
-void OxXmlStore::setValue(OxXmlAttribute* attribute, char const* text, std::size_t length) {
-    char* copy = copyTrimmed(text, length);
-    if ((attribute->storage & OxXmlAttribute::kStoredValue) == 0) {
-        delete[] attribute->value;
-    }
-    attribute->value = copy;
-    attribute->storage |= OxXmlAttribute::kStoredValue;
-}
-
 void OxXmlStore::setValue(OxXmlElement* element, char const* text, std::size_t length) {
-    char* copy = copyTrimmed(text, length);
+    char* copy = copyValue(text, length);
     if ((element->storage & OxXmlElement::kStoredValue) == 0) {
         delete[] element->value;
     }
@@ -147,32 +110,45 @@ void OxXmlStore::setValue(OxXmlElement* element, char const* text, std::size_t l
     element->storage |= OxXmlElement::kStoredValue;
 }
 
-void OxXmlStore::addAttributes(OxXmlElement* element, OxXmlAttribute* const* list,
-                               unsigned int count) {
+char const* OxXmlStore::holdName(char const* sharedName) {
+    names.reserve(names.length + 1);
+    names.append(OxXmlNames::share(sharedName));
+    return sharedName;
+}
+
+OxCsvColumns* OxXmlStore::newColumns(char separator) {
+    tables.reserve(tables.length + 1);
+    auto* columns = new OxCsvColumns;
+    columns->separator = separator;
+    tables.append(columns);
+    return columns;
+}
+
+void OxXmlStore::setPendingPairs(OxXmlElement* element, OxXmlPendingPair const* pairs,
+                                 unsigned int count) {
     if (count == 0) {
         return;
     }
-    if (element->attributes != nullptr || (element->storage & OxXmlElement::kStoredNode) == 0) {
-        element->reserveAttributes(element->getNbAttributes() + count);
-        for (unsigned int i = 0; i < count; i++) {
-            element->addAttribute(list[i]);
-        }
-        return;
-    }
-    using List = OxGList<OxXmlAttribute*>;
-    // The slots are pointers to attributes.
-    void* memory = allocate(sizeof(List) + count * sizeof(void*));
-    List* stored = storedList<OxXmlAttribute*>(memory, count);
-    for (unsigned int i = 0; i < count; i++) {
-        stored->data[i] = list[i];
-    }
-    stored->length = count;
-    element->attributes = stored;
-    element->storage |= OxXmlElement::kStoredAttributes;
+    void* memory = allocate(OxXmlPendingAttributes::pairsBytes(count));
+    auto* pending = ::new (memory) OxXmlPendingAttributes{count, OxXmlPendingAttributes::kPairs};
+    std::memcpy(static_cast<void*>(pending->pairs()), pairs, count * sizeof(OxXmlPendingPair));
+    element->pending = pending;
+    element->storage |= OxXmlElement::kPendingAttributes;
 }
 
-void OxXmlStore::discard(OxXmlAttribute* attribute) {
-    OxXmlAttribute::release(attribute);
+void OxXmlStore::setPendingLine(OxXmlElement* element, OxCsvColumns const* columns,
+                                unsigned int count, char const* line, std::size_t length) {
+    if (count == 0) {
+        return;
+    }
+    void* memory = allocate(OxXmlPendingAttributes::lineBytes(length));
+    auto* pending = ::new (memory) OxXmlPendingAttributes{count, OxXmlPendingAttributes::kCsvLine};
+    pending->columns() = columns;
+    char* text = pending->line();
+    std::memcpy(text, line, length);
+    text[length] = '\0';
+    element->pending = pending;
+    element->storage |= OxXmlElement::kPendingAttributes;
 }
 
 void OxXmlStore::discard(OxXmlElement* element) {
