@@ -16,7 +16,8 @@
 namespace oxbase {
 namespace detail {
 
-/// The lines of a text-mode input, whole, whatever their length.
+/// The lines of a text-mode input, whole, whatever their length. Eight bytes
+/// behind the end of each line handed out may be read (not written).
 ///
 /// One buffer serves the whole file: blocks are read into it behind the
 /// unfinished line, a finished line is handed out in place, and the buffer
@@ -35,7 +36,7 @@ public:
     void start(long long length) {
         remaining = length > 0 ? length : 0;
         capacity = kInitialCapacity;
-        buffer = new char[capacity];
+        buffer = newBuffer(capacity);
     }
 
     /// The next line without its line end, in place: `line` and `length`.
@@ -75,6 +76,15 @@ public:
 
 private:
     static constexpr size_t kNone = static_cast<size_t>(-1);
+    /// Bytes behind the buffer's capacity that may be read (never used for
+    /// text), so that a reader may load a whole word at any place of a line.
+    static constexpr size_t kSlack = 8;
+
+    static char* newBuffer(size_t size) {
+        char* memory = new char[size + kSlack];
+        std::memset(memory + size, 0, kSlack);
+        return memory;
+    }
     static constexpr size_t kInitialCapacity = 64 * 1024;
 
     /// Notes whether the line that ends before `lineStart` holds the next
@@ -101,7 +111,7 @@ private:
             lineStart = 0;
         }
         if (capacity - 1 - filled < kMinimumRead) {
-            char* bigger = new char[capacity * 2];
+            char* bigger = newBuffer(capacity * 2);
             std::memcpy(bigger, buffer, filled);
             delete[] buffer;
             buffer = bigger;

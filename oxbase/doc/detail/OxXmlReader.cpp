@@ -37,6 +37,23 @@ struct NameEnds {
     }
 };
 constexpr NameEnds kNameEnds;
+
+/// The bits of the first n characters of a text loaded as a 64-bit number,
+/// n below 8, whatever the byte order.
+struct HeadMasks {
+    std::uint64_t of[8] = {};
+    HeadMasks() {
+        for (unsigned int n = 0; n < 8; n++) {
+            unsigned char bytes[8] = {};
+            for (unsigned int i = 0; i < n; i++) {
+                bytes[i] = 0xFF;
+            }
+            std::memcpy(&of[n], bytes, sizeof bytes);
+        }
+    }
+    std::uint64_t operator[](size_t n) const { return of[n]; }
+};
+const HeadMasks kHeadMask;
 } // namespace
 
 OxXmlReader::NameCache::~NameCache() {
@@ -50,25 +67,18 @@ char const* OxXmlReader::NameCache::lookup(char const* text, size_t length) {
     if (length == 0) {
         return nullptr;
     }
-    // The length and three characters, mixed by one multiplication: enough
-    // to keep the names of a document apart, at a cost that does not grow
-    // with the name.
-    auto at = [text](size_t i) {
-        return static_cast<std::uint32_t>(static_cast<unsigned char>(text[i]));
-    };
-    std::uint32_t key = static_cast<std::uint32_t>(length) ^ (at(0) << 8) ^ (at(length / 2) << 16) ^
-                        (at(length - 1) << 24);
-    std::uint32_t hash = key * 2654435761u;
-    Entry& entry = slots[(hash >> 24) % kSlots];
-    if (entry.length == length && entry.raw != nullptr) {
-        // Names are short: a plain loop beats a library call.
-        size_t same = 0;
-        while (same < length && entry.raw[same] == text[same]) {
-            same++;
-        }
-        if (same == length) {
-            return entry.shared;
-        }
+    // The first eight characters as a number: with the length it picks the
+    // slot and tells most names apart without a comparison of texts.
+    // (The line source keeps eight readable bytes behind every line.)
+    std::uint64_t key = 0;
+    std::memcpy(&key, text, sizeof key);
+    if (length < 8) {
+        key &= kHeadMask[length];
+    }
+    Entry& entry = slots[(((key ^ length) * 0x9E3779B97F4A7C15ULL) >> 56) % kSlots];
+    if (entry.key == key && entry.length == length && entry.raw != nullptr &&
+        (length <= 8 || std::memcmp(entry.raw + 8, text + 8, length - 8) == 0)) {
+        return entry.shared;
     }
     // A new name: its shared text and a copy of the raw text first, so that
     // the entry is replaced only when both are there.
@@ -82,6 +92,7 @@ char const* OxXmlReader::NameCache::lookup(char const* text, size_t length) {
     delete[] entry.raw;
     OxXmlNames::release(entry.shared);
     entry.raw = raw.release();
+    entry.key = key;
     entry.length = length;
     entry.shared = shared;
     return shared;
@@ -191,7 +202,7 @@ int OxXmlReader::doStart() {
 }
 
 int OxXmlReader::doContent() {
-    char* open = find(cursor, '<');
+    char* open = *cursor == '<' ? cursor : find(cursor, '<');
     if (open == nullptr) {
         cursor = lineEnd; // text between elements is ignored
         return kGoOn;
@@ -242,9 +253,13 @@ int OxXmlReader::doContent() {
         return kGoOn;
     }
     createElement(open, nameBegin, nameEnd, true);
-    state = *nameEnd == '>' ? ELEMENT_VALUE : ATTRIBUTE;
     cursor = nameEnd + 1;
-    return kGoOn;
+    if (*nameEnd == '>') {
+        state = ELEMENT_VALUE;
+        return kGoOn;
+    }
+    state = ATTRIBUTE;
+    return cursor < lineEnd ? doAttribute() : kGoOn;
 }
 
 int OxXmlReader::doElementValue() {
@@ -273,53 +288,93 @@ int OxXmlReader::doElementValue() {
 }
 
 int OxXmlReader::doAttribute() {
-    skipBlanks();
-    char* nameBegin = cursor;
-    while (!kNameEnds.ends(*cursor, kAttributeName)) {
-        cursor++;
-    }
-    char* nameEnd = cursor;
-    skipBlanks();
-    if (cursor == lineEnd) {
-        return kGoOn; // the tag goes on on the next line
-    }
-    switch (*cursor) {
-    case '/':
-        if (cursor[1] != '>') {
-            return OxMsgXmlBadTagEnd;
+    // One pass over the attributes of the line: the cursor is a local until
+    // the tag ends, the line does, or a value needs the general road (no
+    // quote, or a value going on over lines: ATTRIBUTE_VALUE). The states
+    // and cursors left behind are those of a step per attribute.
+    char* p = cursor;
+    for (;;) {
+        while (*p == ' ') {
+            p++;
         }
-        commitAttributes();
-        if (current != nullptr) {
-            current = current->getParent();
+        char* nameBegin = p;
+        while (!kNameEnds.ends(*p, kAttributeName)) {
+            p++;
         }
-        cursor++;
-        state = CONTENT;
-        return kGoOn;
-    case '=':
-        attributeOpen = false;
-        if (current != nullptr) {
-            if (tagElement != current) {
-                commitAttributes();
-                tagElement = current;
+        char* nameEnd = p;
+        while (*p == ' ') {
+            p++;
+        }
+        cursor = p;
+        if (p == lineEnd) {
+            return kGoOn; // the tag goes on on the next line
+        }
+        switch (*p) {
+        case '/':
+            if (p[1] != '>') {
+                return OxMsgXmlBadTagEnd;
             }
-            OxXmlPendingPair pair{names.lookup(nameBegin, static_cast<size_t>(nameEnd - nameBegin)),
-                                  nullptr};
-            tagPairs.append(pair);
-            // Its element gets it at the tag's end; its value comes next.
-            attribute = tagPairs.length - 1;
-            attributeOpen = true;
+            commitAttributes();
+            if (current != nullptr) {
+                current = current->getParent();
+            }
+            cursor = p + 1;
+            state = CONTENT;
+            return kGoOn;
+        case '=':
+            openAttribute(nameBegin, nameEnd);
+            p++;
+            if (char* close = quotedOnLine(p)) {
+                setAttributeValue(p + 1, static_cast<size_t>(close - (p + 1)));
+                p = close + 1;
+                continue; // still ATTRIBUTE
+            }
+            cursor = p;
+            state = ATTRIBUTE_VALUE;
+            return kGoOn;
+        case '>':
+            commitAttributes();
+            cursor = p + 1;
+            state = ELEMENT_VALUE;
+            return kGoOn;
+        default:
+            continue; // a name without "=" is dropped
         }
-        cursor++;
-        state = ATTRIBUTE_VALUE;
-        return kGoOn;
-    case '>':
-        commitAttributes();
-        cursor++;
-        state = ELEMENT_VALUE;
-        return kGoOn;
-    default:
-        return kGoOn; // a name without "=" is dropped
     }
+}
+
+void OxXmlReader::openAttribute(char* nameBegin, char* nameEnd) {
+    attributeOpen = false;
+    if (current == nullptr) {
+        return;
+    }
+    if (tagElement != current) {
+        commitAttributes();
+        tagElement = current;
+    }
+    OxXmlPendingPair pair{names.lookup(nameBegin, static_cast<size_t>(nameEnd - nameBegin)),
+                          nullptr};
+    tagPairs.append(pair);
+    // Its element gets it at the tag's end; its value comes next.
+    attribute = tagPairs.length - 1;
+    attributeOpen = true;
+}
+
+char* OxXmlReader::quotedOnLine(char*& p) {
+    char* open = p;
+    while (*open == ' ') {
+        open++;
+    }
+    if (*open != '"' && *open != '\'') {
+        return nullptr;
+    }
+    char* close = find(open + 1, *open);
+    if (close == nullptr) {
+        return nullptr;
+    }
+    quote = *open;
+    p = open;
+    return close;
 }
 
 int OxXmlReader::doAttributeValue() {

@@ -12,6 +12,7 @@
 #include "oxbase/doc/detail/OxXmlTextBuffer.h"
 
 #include <cstddef>
+#include <cstdint>
 #include <cstring>
 
 class OxXmlElement;
@@ -59,6 +60,7 @@ class OxXmlReader {
     private:
         struct Entry {
             char const* raw = nullptr; ///< the raw text, a copy owned here
+            std::uint64_t key = 0;     ///< its first eight characters
             size_t length = 0;
             char const* shared = nullptr;
         };
@@ -130,6 +132,13 @@ private:
     void attach(OxXmlElement* node);
     /// Hands the attributes of the tag in progress to their element.
     void commitAttributes();
+    /// Opens the attribute [nameBegin, nameEnd) of the current element (none
+    /// without one): the attribute in progress, its value to come.
+    void openAttribute(char* nameBegin, char* nameEnd);
+    /// For `p` behind "=": when blanks, a quote and its closing quote follow
+    /// on this line, moves `p` to the opening quote and returns the closing
+    /// one; otherwise null and `p` stays.
+    char* quotedOnLine(char*& p);
     /// Gives the attribute in progress the value [text, text + length).
     void setAttributeValue(char const* text, size_t length) {
         if (attributeOpen) {

@@ -66,24 +66,6 @@ void* OxXmlStore::allocate(std::size_t size) {
     return block;
 }
 
-char* OxXmlStore::copyValue(char const* text, std::size_t length) {
-    if (length == 0) {
-        return nullptr;
-    }
-    char const* first = text;
-    char const* last = text + length;
-    OxXmlNames::trim(first, last);
-    auto count = static_cast<std::size_t>(last - first);
-    if (cursor == nullptr || static_cast<std::size_t>(end - cursor) < count + 1) {
-        grow(count + 1);
-    }
-    char* copy = cursor;
-    std::memcpy(copy, first, count);
-    copy[count] = '\0';
-    cursor += count + 1;
-    return copy;
-}
-
 OxXmlElement* OxXmlStore::newElement(char const* name, std::size_t length) {
     void* memory = allocate(sizeof(OxXmlElement));
     char const* shared = OxXmlNames::acquire(name, length);

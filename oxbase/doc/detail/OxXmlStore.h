@@ -29,8 +29,10 @@
 #define OXBASE_DOC_DETAIL_OXXMLSTORE_H
 
 #include "oxbase/core/OxGList.h"
+#include "oxbase/doc/detail/OxXmlNames.h"
 
 #include <cstddef>
+#include <cstring>
 
 class OxXmlElement;
 
@@ -56,7 +58,23 @@ public:
     OxXmlElement* newElementShared(char const* sharedName);
     /// A copy of [text, text + length) trimmed as setValue trims, in the
     /// store: null for length 0, an empty text for white space alone.
-    char* copyValue(char const* text, std::size_t length);
+    char* copyValue(char const* text, std::size_t length) {
+        if (length == 0) {
+            return nullptr;
+        }
+        char const* first = text;
+        char const* last = text + length;
+        OxXmlNames::trim(first, last);
+        auto count = static_cast<std::size_t>(last - first);
+        if (cursor == nullptr || static_cast<std::size_t>(end - cursor) < count + 1) {
+            grow(count + 1);
+        }
+        char* copy = cursor;
+        std::memcpy(copy, first, count);
+        copy[count] = '\0';
+        cursor += count + 1;
+        return copy;
+    }
     /// The same for the value of a stored element.
     void setValue(OxXmlElement* element, char const* text, std::size_t length);
     /// Holds one use of `sharedName` (OxXmlNames) until the store goes, so
