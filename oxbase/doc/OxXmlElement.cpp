@@ -138,6 +138,13 @@ void OxXmlElement::release(OxXmlElement* element) {
     }
 }
 
+OxXmlPendingAttributes* OxXmlElement::pendingPairs() const {
+    if ((storage & kPendingAttributes) == 0 || pending->kind != OxXmlPendingAttributes::kPairs) {
+        return nullptr;
+    }
+    return pending;
+}
+
 void OxXmlElement::buildPendingAttributes() const {
     // Every allocation comes first: a failure leaves the attributes pending
     // and the pending form untouched (the CSV form is read only once).

@@ -178,6 +178,9 @@ private:
         }
         return attributes;
     }
+    /// The pending attributes when they are the pairs of a read XML tag
+    /// (null otherwise), for the writer, which writes them as they stand.
+    oxbase::detail::OxXmlPendingAttributes* pendingPairs() const;
     /// Turns the pending attributes into objects in a list of their own.
     /// The element is never a const object: only the store makes pending
     /// attributes, on the elements it builds.

@@ -288,10 +288,10 @@ int OxXmlReader::doElementValue() {
 }
 
 int OxXmlReader::doAttribute() {
-    // One pass over the attributes of the line: the cursor is a local until
-    // the tag ends, the line does, or a value needs the general road (no
-    // quote, or a value going on over lines: ATTRIBUTE_VALUE). The states
-    // and cursors left behind are those of a step per attribute.
+    // One pass over the attributes of the line, the cursor in a local while
+    // names are scanned, until the tag ends, the line does, or a value does
+    // not close on its line. The states and cursors left behind are those of
+    // a step per state.
     char* p = cursor;
     for (;;) {
         while (*p == ' ') {
@@ -321,17 +321,17 @@ int OxXmlReader::doAttribute() {
             cursor = p + 1;
             state = CONTENT;
             return kGoOn;
-        case '=':
+        case '=': {
             openAttribute(nameBegin, nameEnd);
-            p++;
-            if (char* close = quotedOnLine(p)) {
-                setAttributeValue(p + 1, static_cast<size_t>(close - (p + 1)));
-                p = close + 1;
-                continue; // still ATTRIBUTE
-            }
-            cursor = p;
+            cursor = p + 1;
             state = ATTRIBUTE_VALUE;
-            return kGoOn;
+            int outcome = doAttributeValue();
+            if (outcome != kGoOn || state != ATTRIBUTE) {
+                return outcome; // an error, or a value that goes on
+            }
+            p = cursor;
+            continue;
+        }
         case '>':
             commitAttributes();
             cursor = p + 1;
@@ -358,23 +358,6 @@ void OxXmlReader::openAttribute(char* nameBegin, char* nameEnd) {
     // Its element gets it at the tag's end; its value comes next.
     attribute = tagPairs.length - 1;
     attributeOpen = true;
-}
-
-char* OxXmlReader::quotedOnLine(char*& p) {
-    char* open = p;
-    while (*open == ' ') {
-        open++;
-    }
-    if (*open != '"' && *open != '\'') {
-        return nullptr;
-    }
-    char* close = find(open + 1, *open);
-    if (close == nullptr) {
-        return nullptr;
-    }
-    quote = *open;
-    p = open;
-    return close;
 }
 
 int OxXmlReader::doAttributeValue() {

@@ -135,10 +135,7 @@ private:
     /// Opens the attribute [nameBegin, nameEnd) of the current element (none
     /// without one): the attribute in progress, its value to come.
     void openAttribute(char* nameBegin, char* nameEnd);
-    /// For `p` behind "=": when blanks, a quote and its closing quote follow
-    /// on this line, moves `p` to the opening quote and returns the closing
-    /// one; otherwise null and `p` stays.
-    char* quotedOnLine(char*& p);
+
     /// Gives the attribute in progress the value [text, text + length).
     void setAttributeValue(char const* text, size_t length) {
         if (attributeOpen) {
