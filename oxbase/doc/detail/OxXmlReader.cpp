@@ -76,10 +76,16 @@ char const* OxXmlReader::NameCache::lookup(char const* text, size_t length) {
         key &= kHeadMask[length];
     }
     Entry& entry = slots[(((key ^ length) * 0x9E3779B97F4A7C15ULL) >> 56) % kSlots];
-    if (entry.key == key && entry.length == length && entry.raw != nullptr &&
+    // (An empty entry has the length 0, which no name has.)
+    if (entry.key == key && entry.length == length &&
         (length <= 8 || std::memcmp(entry.raw + 8, text + 8, length - 8) == 0)) {
         return entry.shared;
     }
+    return fill(entry, text, length, key);
+}
+
+char const* OxXmlReader::NameCache::fill(Entry& entry, char const* text, size_t length,
+                                         std::uint64_t key) {
     // A new name: its shared text and a copy of the raw text first, so that
     // the entry is replaced only when both are there.
     std::unique_ptr<char[]> raw(new char[length]);
@@ -249,7 +255,7 @@ int OxXmlReader::doContent() {
             return OxMsgXmlBadTagEnd;
         }
         createElement(open, nameBegin, nameEnd, false);
-        cursor = nameEnd + 1;
+        cursor = nameEnd + 2; // CONTENT would skip the ">" as text
         return kGoOn;
     }
     createElement(open, nameBegin, nameEnd, true);
@@ -318,7 +324,7 @@ int OxXmlReader::doAttribute() {
             if (current != nullptr) {
                 current = current->getParent();
             }
-            cursor = p + 1;
+            cursor = p + 2; // CONTENT would skip the ">" as text
             state = CONTENT;
             return kGoOn;
         case '=': {
@@ -361,21 +367,28 @@ void OxXmlReader::openAttribute(char* nameBegin, char* nameEnd) {
 }
 
 int OxXmlReader::doAttributeValue() {
-    skipBlanks();
-    if (cursor == lineEnd) {
+    char* p = cursor;
+    while (*p == ' ') { // the NUL behind the line stops it
+        p++;
+    }
+    cursor = p;
+    if (p == lineEnd) {
         return kGoOn;
     }
-    if (*cursor != '"' && *cursor != '\'') {
+    char open = *p;
+    if (open != '"' && open != '\'') {
         return OxMsgXmlNoQuote;
     }
-    quote = *cursor++;
-    char* close = find(cursor, quote);
+    quote = open;
+    p++;
+    auto* close = static_cast<char*>(std::memchr(p, open, static_cast<size_t>(lineEnd - p)));
     if (close != nullptr) {
-        setAttributeValue(cursor, static_cast<size_t>(close - cursor));
+        setAttributeValue(p, static_cast<size_t>(close - p));
         cursor = close + 1;
         state = ATTRIBUTE;
         return kGoOn;
     }
+    cursor = p;
     // The value goes on on the next lines; each line end becomes one blank.
     // A quote that ends its line leaves nothing to gather, and the value then
     // fails at its closing quote.

@@ -64,8 +64,10 @@ class OxXmlReader {
             size_t length = 0;
             char const* shared = nullptr;
         };
-        /// Slots by a hash of the whole raw text: the few dozen names of a
-        /// document rarely meet in one slot.
+        /// Puts the name [text, text + length) into `entry`, its slot.
+        char const* fill(Entry& entry, char const* text, size_t length, std::uint64_t key);
+        /// Slots by the length and the first eight characters: the few
+        /// dozen names of a document rarely meet in one slot.
         static constexpr size_t kSlots = 256;
         OxXmlStore& store;
         Entry slots[kSlots];
