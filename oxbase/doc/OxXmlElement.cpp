@@ -87,7 +87,9 @@ void OxXmlElement::operator delete(void* memory, std::nothrow_t const&) noexcept
 
 OxXmlElement::~OxXmlElement() {
     delete[] xsiType;
-    OxXmlNames::release(name);
+    if ((storage & kHeldName) == 0) {
+        OxXmlNames::release(name);
+    }
     if ((storage & kStoredValue) == 0) {
         delete[] value;
     }
@@ -101,29 +103,59 @@ OxXmlElement::~OxXmlElement() {
     if (children == nullptr) {
         return;
     }
-    // The subtree goes without recursion: every element waiting for deletion
-    // is chained through its `parent` field, which nobody reads any more, and
-    // hands its own children to the chain before it is deleted childless.
-    OxXmlElement* pending = nullptr;
-    auto takeChildren = [&pending](OxGList<OxXmlElement*>*& list) {
-        for (unsigned int i = 0; i < list->length; i++) {
-            OxXmlElement* child = list->data[i];
-            if (child != nullptr) {
-                child->parent = pending;
-                pending = child;
+    // The subtree goes without recursion, depth first over the child lists
+    // with a stack of levels of its own: the next element is always read
+    // from a list, so that the memory of many elements is fetched at once
+    // (a chain through the elements would wait for each in turn). A subtree
+    // deeper than the levels waits in a chain through its root's `parent`
+    // field, which nobody reads any more, and is taken up when the levels
+    // are done. An element is destroyed childless, after its children.
+    struct Level {
+        OxXmlElement* owner;
+        OxGList<OxXmlElement*>* list;
+        unsigned int next;
+    };
+    constexpr unsigned int kLevels = 32;
+    Level levels[kLevels];
+    unsigned int depth = 0;
+    OxXmlElement* waiting = nullptr;
+    auto open = [&levels, &depth](OxXmlElement* owner) {
+        levels[depth++] = Level{owner, owner->children, 0};
+        owner->children = nullptr;
+    };
+    open(this);
+    for (;;) {
+        while (depth > 0) {
+            Level& top = levels[depth - 1];
+            if (top.next == top.list->length) {
+                if ((top.owner->storage & kStoredChildren) == 0) {
+                    deleteList(top.list); // a stored list goes with the store
+                }
+                if (top.owner != this) {
+                    release(top.owner);
+                }
+                depth--;
+                continue;
+            }
+            OxXmlElement* child = top.list->data[top.next++];
+            if (child == nullptr) {
+                continue;
+            }
+            if (child->children == nullptr) {
+                release(child);
+            } else if (depth == kLevels) {
+                child->parent = waiting;
+                waiting = child;
+            } else {
+                open(child);
             }
         }
-        deleteList(list);
-        list = nullptr;
-    };
-    takeChildren(children);
-    while (pending != nullptr) {
-        OxXmlElement* element = pending;
-        pending = element->parent;
-        if (element->children != nullptr) {
-            takeChildren(element->children);
+        if (waiting == nullptr) {
+            return;
         }
-        release(element);
+        OxXmlElement* next = waiting;
+        waiting = next->parent;
+        open(next);
     }
 }
 
@@ -195,6 +227,15 @@ void OxXmlElement::reserveAttributes(unsigned int count) {
 void OxXmlElement::addChild(OxXmlElement* child) {
     if (children == nullptr) {
         children = newList<OxXmlElement*>(4);
+    } else if ((storage & kStoredChildren) != 0) {
+        // A stored list is exact: the list moves to the heap with room to grow.
+        OxGList<OxXmlElement*>* list = newList<OxXmlElement*>(children->length * 2 + 1);
+        for (unsigned int i = 0; i < children->length; i++) {
+            list->data[i] = children->data[i];
+        }
+        list->length = children->length;
+        children = list;
+        storage &= static_cast<std::uint8_t>(~kStoredChildren);
     }
     children->append(child);
 }
@@ -315,7 +356,10 @@ OxBool OxXmlElement::isYes(char const* attributeName) const {
 void OxXmlElement::setName(char const* newName) {
     char const* old = name;
     name = OxXmlNames::acquire(newName);
-    OxXmlNames::release(old);
+    if ((storage & kHeldName) == 0) {
+        OxXmlNames::release(old);
+    }
+    storage &= static_cast<std::uint8_t>(~kHeldName);
 }
 
 void OxXmlElement::setValue(char const* newValue) {

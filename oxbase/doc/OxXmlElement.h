@@ -165,8 +165,16 @@ private:
     /// it; a stored value is a text there, which setValue replaces by a heap
     /// copy, so callers see no difference. With pending attributes `pending`
     /// is set instead of `attributes`; built attributes come from the heap
-    /// and keep their values in the store.
-    enum : std::uint8_t { kStoredNode = 1, kStoredValue = 2, kPendingAttributes = 4 };
+    /// and keep their values in the store. A stored child list is an exact
+    /// array there, moved to the heap by addChild. A held name is one whose
+    /// use the store holds for the element (setName takes a use of its own).
+    enum : std::uint8_t {
+        kStoredNode = 1,
+        kStoredValue = 2,
+        kPendingAttributes = 4,
+        kStoredChildren = 8,
+        kHeldName = 16
+    };
     /// Destroys `element` and its subtree as their storage requires (null is
     /// ignored): the way a document and a parent end the nodes they own.
     static void release(OxXmlElement* element);

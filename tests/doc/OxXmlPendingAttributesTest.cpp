@@ -121,6 +121,30 @@ TEST_F(PendingTest, XmlFirstUseThroughAMutatorOrATypedGetter) {
     EXPECT_EQ(r->getNbChildElements(), 0u);
 }
 
+TEST_F(PendingTest, ReadChildListsAndNamesChangeLikeAnyOther) {
+    // The child lists and names of read elements live in the document's
+    // store until they change; every change reads back as on a built tree.
+    auto tree = readXml("<?xml version=\"1.0\"?>\n<r>\n <p i=\"1\"/>\n <q/>\n <p i=\"3\">\n"
+                        "  <s/>\n </p>\n</r>\n");
+    OxXmlElement* r = tree->getRootForUpdate();
+    ASSERT_EQ(r->getNbChildElements(), 3u);
+    EXPECT_EQ(r->getChild(2)->getNbChildElements(), 1u);
+    EXPECT_EQ(r->getChild(2)->getChild(0)->getParent(), r->getChild(2));
+    r->addChild(new OxXmlElement("t")); // the read list moves, in order
+    ASSERT_EQ(r->getNbChildElements(), 4u);
+    EXPECT_STREQ(r->getChild(1)->getName(), "q");
+    EXPECT_STREQ(r->getChild(3)->getName(), "t");
+    EXPECT_EQ(r->deleteChild(1), OxTrue);
+    EXPECT_EQ(r->getChild(1), nullptr);
+    r->getChild(0)->setName("renamed"); // a read name replaced, twice
+    r->getChild(0)->setName("again");
+    r->getChild(2)->getChild(0)->addChild(new OxXmlElement("u"));
+    EXPECT_EQ(r->deleteChildren("p"), OxTrue);
+    ASSERT_EQ(r->getNbChildElements(), 2u);
+    EXPECT_STREQ(r->getChild(0)->getName(), "again");
+    EXPECT_STREQ(r->getChild(1)->getName(), "t");
+}
+
 TEST_F(PendingTest, CsvRecordsKeepTheirFieldsUntilAsked) {
     // White space alone is an empty value, not none; a field behind the
     // header is named by its position; names are the header's of this read.

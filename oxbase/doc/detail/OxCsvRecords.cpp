@@ -15,36 +15,21 @@ OxCsvRecords::OxCsvRecords(OxXmlStore& recordStore, OxXmlElement& recordRoot,
                            OxGList<char*> const& columnNames, char fieldSeparator)
     : store(recordStore), root(recordRoot), header(columnNames), separator(fieldSeparator) {
     columns = store.newColumns(separator);
-    // Last: nothing to give back should this fail.
-    recordName = OxXmlNames::acquire("record", 6);
-}
-
-OxCsvRecords::~OxCsvRecords() {
-    OxXmlNames::release(recordName);
+    recordName = store.holdText("record");
 }
 
 void OxCsvRecords::cover(unsigned int positions) {
     OxGList<char const*>& names = columns->names;
     while (names.length < positions) {
         unsigned int position = names.length;
-        char const* name = nullptr;
+        names.reserve(position + 1);
         if (position < header.length) {
-            name = OxXmlNames::acquire(header.data[position]);
+            names.append(store.holdText(header.data[position]));
         } else {
             char generated[24];
             std::snprintf(generated, sizeof generated, "column%u", position);
-            name = OxXmlNames::acquire(generated);
+            names.append(store.holdText(generated));
         }
-        // The store holds the name for the records; this use goes.
-        bool held = withMemory([&] {
-            store.holdName(name);
-            names.reserve(position + 1);
-        });
-        OxXmlNames::release(name);
-        if (!held) {
-            throw std::bad_alloc();
-        }
-        names.append(name);
     }
 }
 
@@ -72,7 +57,7 @@ void OxCsvRecords::take(char const* line, std::size_t length) {
         covered = position + 1;
     }
     cover(covered);
-    OxXmlElement* record = store.newElementShared(recordName);
+    OxXmlElement* record = store.newElementHeld(recordName);
     bool placed = withMemory([&] {
         store.setPendingLine(record, columns, count, line, length);
         root.addChild(record);

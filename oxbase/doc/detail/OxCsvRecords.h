@@ -34,7 +34,7 @@ public:
                  char separator);
     OxCsvRecords(const OxCsvRecords&) = delete;
     OxCsvRecords& operator=(const OxCsvRecords&) = delete;
-    ~OxCsvRecords();
+    ~OxCsvRecords() = default;
 
     /// Adds the record of the `length` characters at `line` (trimmed, no NUL
     /// among them). Without memory std::bad_alloc, and no part of the record
@@ -50,7 +50,7 @@ private:
     OxGList<char*> const& header;
     OxCsvColumns* columns = nullptr;
     char separator;
-    char const* recordName = nullptr;
+    char const* recordName = nullptr; ///< held by the store
 };
 
 } // namespace detail

@@ -322,7 +322,7 @@ int OxXmlReader::doAttribute() {
             }
             commitAttributes();
             if (current != nullptr) {
-                current = current->getParent();
+                closeCurrent();
             }
             cursor = p + 2; // CONTENT would skip the ">" as text
             state = CONTENT;
@@ -486,15 +486,14 @@ int OxXmlReader::doDoctype() {
 void OxXmlReader::createElement(char* tagStart, char* nameBegin, char* nameEnd, bool makeCurrent) {
     commitAttributes();
     OxXmlElement* element =
-        store.newElementShared(names.lookup(nameBegin, static_cast<size_t>(nameEnd - nameBegin)));
+        store.newElementHeld(names.lookup(nameBegin, static_cast<size_t>(nameEnd - nameBegin)));
     // Until a place in the document has it, the element is destroyed when
     // memory runs out.
     bool placed = withMemory([&] {
         if (file.root == nullptr) {
             file.root = element;
         } else if (current != nullptr) {
-            current->addChild(element);
-            element->setParent(current);
+            addToCurrent(element);
         } else {
             // A second element at top level has no parent to go to: it is
             // kept behind the root, where the writer writes it back.
@@ -508,7 +507,7 @@ void OxXmlReader::createElement(char* tagStart, char* nameBegin, char* nameEnd, 
         throw std::bad_alloc();
     }
     if (makeCurrent) {
-        current = element;
+        openElement(element);
     }
 }
 
@@ -528,7 +527,7 @@ void OxXmlReader::closeByEndTag(char* tagStart, char* nameBegin) {
                        openName);
         });
     }
-    current = current->getParent();
+    closeCurrent();
 }
 
 void OxXmlReader::attach(OxXmlElement* node) {
@@ -536,8 +535,7 @@ void OxXmlReader::attach(OxXmlElement* node) {
         return;
     }
     if (current != nullptr) {
-        current->addChild(node);
-        node->setParent(current);
+        addToCurrent(node);
     } else if (file.root == nullptr) {
         file.preRootNodes.append(node);
     } else {
@@ -584,6 +582,36 @@ void OxXmlReader::finish() {
     if (doctypeLoaded && file.doctype != nullptr) {
         file.doctype->setValue(doctypeText.text());
     }
+    while (current != nullptr) {
+        closeCurrent(); // the elements still open get their children
+    }
+}
+
+OxXmlReader::~OxXmlReader() {
+    // Children not yet handed to their element (a read left by
+    // std::bad_alloc) have no other owner.
+    for (unsigned int i = 0; i < openChildren.length; i++) {
+        OxXmlStore::discard(openChildren.data[i]);
+    }
+}
+
+void OxXmlReader::openElement(OxXmlElement* element) {
+    frames.append(Frame{element, openChildren.length});
+    current = element;
+}
+
+void OxXmlReader::closeCurrent() {
+    Frame frame = frames.data[frames.length - 1];
+    unsigned int count = openChildren.length - frame.first;
+    store.setChildren(frame.element, openChildren.data + frame.first, count);
+    openChildren.length = frame.first;
+    frames.length--;
+    current = frames.length > 0 ? frames.data[frames.length - 1].element : nullptr;
+}
+
+void OxXmlReader::addToCurrent(OxXmlElement* node) {
+    openChildren.append(node);
+    node->setParent(current);
 }
 
 } // namespace detail

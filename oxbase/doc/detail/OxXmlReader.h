@@ -80,7 +80,9 @@ public:
         : file(document), store(*document.store), names(*document.store), source(*document.input) {}
     OxXmlReader(const OxXmlReader&) = delete;
     OxXmlReader& operator=(const OxXmlReader&) = delete;
-    ~OxXmlReader() = default;
+    /// Children not yet handed to their element (a read left by
+    /// std::bad_alloc) are destroyed.
+    ~OxXmlReader();
 
     OxBool run();
 
@@ -132,6 +134,14 @@ private:
     void createElement(char* tagStart, char* nameBegin, char* nameEnd, bool makeCurrent);
     void closeByEndTag(char* tagStart, char* nameBegin);
     void attach(OxXmlElement* node);
+    /// `element` becomes the current element; its children are gathered
+    /// until it closes.
+    void openElement(OxXmlElement* element);
+    /// Closes the current element: it gets its children as one exact list
+    /// in the store, and its parent becomes the current element.
+    void closeCurrent();
+    /// Adds `node` to the children of the current element (there is one).
+    void addToCurrent(OxXmlElement* node);
     /// Hands the attributes of the tag in progress to their element.
     void commitAttributes();
     /// Opens the attribute [nameBegin, nameEnd) of the current element (none
@@ -160,6 +170,14 @@ private:
     char* cursor = nullptr;
 
     OxXmlElement* current = nullptr;
+    // The open elements, outermost first, each with the place of its first
+    // child in openChildren: the children of all of them, in order.
+    struct Frame {
+        OxXmlElement* element;
+        unsigned int first;
+    };
+    OxGList<Frame> frames;
+    OxGList<OxXmlElement*> openChildren;
     // Comment and CDATA in progress: the node and its text so far.
     bool commentOpen[2] = {false, false};
     OxXmlElement* commentNode[2] = {nullptr, nullptr};

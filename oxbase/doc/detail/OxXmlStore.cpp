@@ -39,6 +39,10 @@ OxXmlStore::~OxXmlStore() {
 }
 
 void OxXmlStore::grow(std::size_t size) {
+    newSlab(size, cursor, end);
+}
+
+void OxXmlStore::newSlab(std::size_t size, char*& areaCursor, char*& areaEnd) {
     nextSlabBytes = nextSlabBytes == 0 ? kFirstSlab : nextSlabBytes;
     std::size_t slabBytes = nextSlabBytes;
     while (slabBytes < kHeader + size) {
@@ -46,24 +50,28 @@ void OxXmlStore::grow(std::size_t size) {
     }
     char* memory = new char[slabBytes];
     slabs = new (memory) Slab{slabs};
-    cursor = memory + kHeader;
-    end = memory + slabBytes;
+    areaCursor = memory + kHeader;
+    areaEnd = memory + slabBytes;
     bytes += slabBytes;
     if (nextSlabBytes < kLargestSlab) {
         nextSlabBytes *= 2;
     }
 }
 
-void* OxXmlStore::allocate(std::size_t size) {
-    auto misalign = reinterpret_cast<std::uintptr_t>(cursor) % alignof(void*);
+void* OxXmlStore::allocateIn(std::size_t size, char*& areaCursor, char*& areaEnd) {
+    auto misalign = reinterpret_cast<std::uintptr_t>(areaCursor) % alignof(void*);
     std::size_t skip = misalign == 0 ? 0 : alignof(void*) - misalign;
-    if (cursor == nullptr || static_cast<std::size_t>(end - cursor) < skip + size) {
-        grow(size);
+    if (areaCursor == nullptr || static_cast<std::size_t>(areaEnd - areaCursor) < skip + size) {
+        newSlab(size, areaCursor, areaEnd);
         skip = 0;
     }
-    void* block = cursor + skip;
-    cursor += skip + size;
+    void* block = areaCursor + skip;
+    areaCursor += skip + size;
     return block;
+}
+
+void* OxXmlStore::allocate(std::size_t size) {
+    return allocateIn(size, cursor, end);
 }
 
 OxXmlElement* OxXmlStore::newElement(char const* name, std::size_t length) {
@@ -75,12 +83,31 @@ OxXmlElement* OxXmlStore::newElement(char const* name, std::size_t length) {
     return element;
 }
 
-OxXmlElement* OxXmlStore::newElementShared(char const* sharedName) {
+OxXmlElement* OxXmlStore::newElementHeld(char const* heldName) {
     void* memory = allocate(sizeof(OxXmlElement));
     auto* element = ::new (memory) OxXmlElement(static_cast<char const*>(nullptr));
-    element->name = OxXmlNames::share(sharedName);
-    element->storage = OxXmlElement::kStoredNode;
+    element->name = heldName;
+    element->storage = OxXmlElement::kStoredNode | OxXmlElement::kHeldName;
     return element;
+}
+
+void OxXmlStore::setChildren(OxXmlElement* element, OxXmlElement* const* list, unsigned int count) {
+    if (count == 0) {
+        return;
+    }
+    using List = OxGList<OxXmlElement*>;
+    // The list object and its slots, one block; the slots are pointers.
+    // Lists have slabs of their own: a list is made when its element ends,
+    // and among the element's descendants it would stand in the way of
+    // everything that walks the tree in document order.
+    void* memory = allocateIn(sizeof(List) + count * sizeof(void*), listCursor, listEnd);
+    auto* stored = ::new (memory) List(0);
+    stored->data = reinterpret_cast<OxXmlElement**>(static_cast<char*>(memory) + sizeof(List));
+    std::memcpy(static_cast<void*>(stored->data), list, count * sizeof(void*));
+    stored->capacity = count;
+    stored->length = count;
+    element->children = stored;
+    element->storage |= OxXmlElement::kStoredChildren;
 }
 
 void OxXmlStore::setValue(OxXmlElement* element, char const* text, std::size_t length) {
@@ -96,6 +123,18 @@ char const* OxXmlStore::holdName(char const* sharedName) {
     names.reserve(names.length + 1);
     names.append(OxXmlNames::share(sharedName));
     return sharedName;
+}
+
+char const* OxXmlStore::holdText(char const* text) {
+    char const* name = OxXmlNames::acquire(text);
+    try {
+        names.reserve(names.length + 1);
+    } catch (const std::bad_alloc&) {
+        OxXmlNames::release(name);
+        throw;
+    }
+    names.append(name);
+    return name;
 }
 
 OxCsvColumns* OxXmlStore::newColumns(char separator) {

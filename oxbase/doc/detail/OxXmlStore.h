@@ -5,10 +5,11 @@
 // text. Taking each of them from the general heap costs a block header per
 // text, a walk of the heap to free each one, and memory that is never
 // touched together. The readers of OxXmlFile and OxCsvFile therefore build
-// their nodes in a store that the document owns: elements, value texts and
-// the pending attributes of each element (OxXmlPendingAttributes) are carved
-// one behind the other out of large slabs, in reading order, and the slabs
-// go back to the heap at once when the document goes.
+// their nodes in a store that the document owns: elements, value texts, the
+// pending attributes of each element (OxXmlPendingAttributes) and the exact
+// child lists of read elements are carved one behind the other out of large
+// slabs, in reading order, and the slabs go back to the heap at once when
+// the document goes.
 //
 //   OxXmlStore store;
 //   OxXmlElement * record = store.newElement("record", 6);
@@ -21,8 +22,8 @@
 // copy, and pending attributes become objects when they are first needed. A
 // node knows that it is stored by a flag; the document destroys its tree
 // before its store, and a stored node is never handed to the heap's delete.
-// The store holds one use of every name that a pending attribute refers to,
-// and the column names of each CSV read.
+// The store holds one use of every name that a pending attribute or a read
+// element refers to, and the column names of each CSV read.
 //
 // Without memory std::bad_alloc, and nothing is taken from the store.
 #ifndef OXBASE_DOC_DETAIL_OXXMLSTORE_H
@@ -54,8 +55,13 @@ public:
     /// An element (XML_TYPE_ELEMENT) named by the shared text of the
     /// `length` characters at `name` (trimmed; none when empty).
     OxXmlElement* newElement(char const* name, std::size_t length);
-    /// The same with a name already shared (OxXmlNames): one user more.
-    OxXmlElement* newElementShared(char const* sharedName);
+    /// The same with a name that this store holds (holdName): the element
+    /// takes no use of its own.
+    OxXmlElement* newElementHeld(char const* heldName);
+    /// Gives `element` (of this store, without children) the `count`
+    /// children at `list` as an exact list in the store. Nothing for a count
+    /// of 0.
+    void setChildren(OxXmlElement* element, OxXmlElement* const* list, unsigned int count);
     /// A copy of [text, text + length) trimmed as setValue trims, in the
     /// store: null for length 0, an empty text for white space alone.
     char* copyValue(char const* text, std::size_t length) {
@@ -80,6 +86,9 @@ public:
     /// Holds one use of `sharedName` (OxXmlNames) until the store goes, so
     /// that pending attributes may refer to it; returns it.
     char const* holdName(char const* sharedName);
+    /// The shared text of `text` (OxXmlNames::acquire, null for a null or
+    /// empty text), held by the store until it goes.
+    char const* holdText(char const* text);
     /// Column names for the records of one CSV read, to be filled by the
     /// caller with names it holds here; they go with the store.
     OxCsvColumns* newColumns(char separator);
@@ -105,6 +114,11 @@ private:
     void* allocate(std::size_t size);
     /// Makes room for `size` bytes at `cursor`.
     void grow(std::size_t size);
+    /// A new slab of at least `size` bytes (and a header) for the area that
+    /// `areaCursor` and `areaEnd` describe.
+    void newSlab(std::size_t size, char*& areaCursor, char*& areaEnd);
+    /// `size` bytes aligned for a pointer in that area.
+    void* allocateIn(std::size_t size, char*& areaCursor, char*& areaEnd);
 
     struct Slab {
         Slab* next;
@@ -112,6 +126,8 @@ private:
     Slab* slabs = nullptr;
     char* cursor = nullptr;
     char* end = nullptr;
+    char* listCursor = nullptr; ///< the area of the child lists
+    char* listEnd = nullptr;
     std::size_t nextSlabBytes = 0;
     std::size_t bytes = 0;
     OxGList<char const*> names{0};
