@@ -230,10 +230,14 @@ void OxXmlElement::addChild(OxXmlElement* child) {
     } else if ((storage & kStoredChildren) != 0) {
         // A stored list is exact: the list moves to the heap with room to grow.
         OxGList<OxXmlElement*>* list = newList<OxXmlElement*>(children->length * 2 + 1);
-        for (unsigned int i = 0; i < children->length; i++) {
-            list->data[i] = children->data[i];
+        try {
+            for (unsigned int i = 0; i < children->length; i++) {
+                list->append(children->data[i]); // within the capacity
+            }
+        } catch (const std::bad_alloc&) {
+            deleteList(list);
+            throw;
         }
-        list->length = children->length;
         children = list;
         storage &= static_cast<std::uint8_t>(~kStoredChildren);
     }

@@ -53,6 +53,9 @@ struct OxXmlPendingAttributes {
     std::uint32_t count; ///< attributes it stands for, at least 1
     Kind kind;
 
+    /// The room of the pointer to the columns (an object pointer).
+    static constexpr std::size_t kColumnsBytes = sizeof(void*);
+
     /// Calls `take(name, value)` for each attribute in list order. The CSV
     /// form writes the ends of its values into its line on the way, so this
     /// runs once per element, and `take` must not fail.
@@ -60,7 +63,7 @@ struct OxXmlPendingAttributes {
 
     OxXmlPendingPair* pairs() { return reinterpret_cast<OxXmlPendingPair*>(this + 1); }
     OxCsvColumns const*& columns() { return *reinterpret_cast<OxCsvColumns const**>(this + 1); }
-    char* line() { return reinterpret_cast<char*>(this + 1) + sizeof(OxCsvColumns const*); }
+    char* line() { return reinterpret_cast<char*>(this + 1) + kColumnsBytes; }
 
     /// Bytes of a pending form with `count` pairs, and of one with a line of
     /// `length` characters.
@@ -68,7 +71,7 @@ struct OxXmlPendingAttributes {
         return sizeof(OxXmlPendingAttributes) + count * sizeof(OxXmlPendingPair);
     }
     static std::size_t lineBytes(std::size_t length) {
-        return sizeof(OxXmlPendingAttributes) + sizeof(OxCsvColumns const*) + length + 1;
+        return sizeof(OxXmlPendingAttributes) + kColumnsBytes + length + 1;
     }
 };
 
