@@ -25,10 +25,23 @@ constexpr std::size_t kHeader = 16;
 } // namespace
 
 OxXmlStore::~OxXmlStore() {
+    // The oldest slab goes first. Slabs lie in the heap in the order they
+    // were taken; freed newest first, each would come back to the top of the
+    // heap and be handed back to the system on its own (a system call and a
+    // flush of the address translations per slab: half a second for a 40 MB
+    // document here). Oldest first, they join into one free block below the
+    // newest, and the heap gives the memory back at most once.
+    Slab* oldest = nullptr;
     while (slabs != nullptr) {
         Slab* next = slabs->next;
-        delete[] reinterpret_cast<char*>(slabs);
+        slabs->next = oldest;
+        oldest = slabs;
         slabs = next;
+    }
+    while (oldest != nullptr) {
+        Slab* next = oldest->next;
+        delete[] reinterpret_cast<char*>(oldest);
+        oldest = next;
     }
     for (unsigned int i = 0; i < names.length; i++) {
         OxXmlNames::release(names.data[i]);
