@@ -8,6 +8,7 @@
 #include "oxbase/doc/OxXmlAttribute.h"
 #include "oxbase/doc/OxXmlElement.h"
 #include "oxbase/doc/detail/OxCsvRecords.h"
+#include "oxbase/doc/detail/OxXmlNames.h"
 #include "oxbase/doc/detail/OxXmlStore.h"
 #include "oxbase/io/OxInput.h"
 #include "oxbase/io/OxOutput.h"
@@ -143,7 +144,7 @@ OxBool OxCsvFile::readFile() {
             // A last line without a line end (or the part of a line that did
             // not fit) is still a line: take it before looking at why the
             // read ended.
-            takeLine(line.get(), headerDone, records);
+            takeLine(line.get(), std::strlen(line.get()), headerDone, records);
             if (more != OxTrue) {
                 break;
             }
@@ -167,15 +168,19 @@ OxBool OxCsvFile::readFile() {
     return OxTrue;
 }
 
-void OxCsvFile::takeLine(char* line, bool& headerDone, OxCsvRecords& records) {
-    OxString::stripWhite(line);
-    if (line[0] == '\0' || isComment(line) == OxTrue) {
+void OxCsvFile::takeLine(char* line, size_t length, bool& headerDone, OxCsvRecords& records) {
+    // Trimmed as OxString::stripWhite trims, without moving the text.
+    char* begin = line;
+    char* end = line + length;
+    OxXmlNames::trim(begin, end);
+    *end = '\0';
+    if (begin == end || isComment(begin) == OxTrue) {
         return;
     }
     if (!headerDone) {
-        headerDone = takeHeader(line);
+        headerDone = takeHeader(begin);
     } else {
-        records.take(line);
+        records.take(begin, static_cast<size_t>(end - begin));
     }
 }
 

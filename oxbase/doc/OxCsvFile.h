@@ -35,6 +35,8 @@
 #include "oxbase/io/OxFile.h"
 #include "oxbase/platform/OxStrstream.h"
 
+#include <cstddef>
+
 class OxInput;
 class OxOutput;
 class OxXmlAttribute;
@@ -132,9 +134,11 @@ public:
 private:
     /// Whether `line` begins with OX_CSV_COMMENT_START (OxFalse for null).
     OxBool isComment(char const* line);
-    /// Trims `line` and files it unless it is blank or a comment: header
-    /// fields while the header is open, otherwise a record under `root`.
-    void takeLine(char* line, bool& headerDone, oxbase::detail::OxCsvRecords& records);
+    /// Trims the `length` characters of `line` (NUL-terminated) and files
+    /// them unless they are blank or a comment: header fields while the
+    /// header is open, otherwise a record under `root`.
+    void takeLine(char* line, size_t length, bool& headerDone,
+                  oxbase::detail::OxCsvRecords& records);
     /// Appends the fields of a header line to the column names; returns
     /// whether the header is complete (the line does not end in the separator).
     bool takeHeader(char* line);

@@ -6,6 +6,7 @@
 #include "oxbase/diag/OxPrt.h"
 #include "oxbase/doc/OxXmlFile.h"
 #include "oxbase/doc/detail/OxXmlNames.h"
+#include "oxbase/doc/detail/OxXmlPendingAttributes.h"
 #include "oxbase/geom/OxColor.h"
 #include "oxbase/geom/OxVec.h"
 
@@ -86,44 +87,75 @@ void OxXmlElement::operator delete(void* memory, std::nothrow_t const&) noexcept
 
 OxXmlElement::~OxXmlElement() {
     delete[] xsiType;
-    OxXmlNames::release(name);
+    if ((storage & kHeldName) == 0) {
+        OxXmlNames::release(name);
+    }
     if ((storage & kStoredValue) == 0) {
         delete[] value;
     }
-    if (attributes != nullptr) {
+    // Pending attributes are texts of the store and go with it.
+    if ((storage & kPendingAttributes) == 0 && attributes != nullptr) {
         for (unsigned int i = 0; i < attributes->length; i++) {
             OxXmlAttribute::release(attributes->data[i]);
         }
-        if ((storage & kStoredAttributes) == 0) {
-            deleteList(attributes);
-        }
+        deleteList(attributes);
     }
     if (children == nullptr) {
         return;
     }
-    // The subtree goes without recursion: every element waiting for deletion
-    // is chained through its `parent` field, which nobody reads any more, and
-    // hands its own children to the chain before it is deleted childless.
-    OxXmlElement* pending = nullptr;
-    auto takeChildren = [&pending](OxGList<OxXmlElement*>*& list) {
-        for (unsigned int i = 0; i < list->length; i++) {
-            OxXmlElement* child = list->data[i];
-            if (child != nullptr) {
-                child->parent = pending;
-                pending = child;
+    // The subtree goes without recursion, depth first over the child lists
+    // with a stack of levels of its own: the next element is always read
+    // from a list, so that the memory of many elements is fetched at once
+    // (a chain through the elements would wait for each in turn). A subtree
+    // deeper than the levels waits in a chain through its root's `parent`
+    // field, which nobody reads any more, and is taken up when the levels
+    // are done. An element is destroyed childless, after its children.
+    struct Level {
+        OxXmlElement* owner;
+        OxGList<OxXmlElement*>* list;
+        unsigned int next;
+    };
+    constexpr unsigned int kLevels = 32;
+    Level levels[kLevels];
+    unsigned int depth = 0;
+    OxXmlElement* waiting = nullptr;
+    auto open = [&levels, &depth](OxXmlElement* owner) {
+        levels[depth++] = Level{owner, owner->children, 0};
+        owner->children = nullptr;
+    };
+    open(this);
+    for (;;) {
+        while (depth > 0) {
+            Level& top = levels[depth - 1];
+            if (top.next == top.list->length) {
+                if ((top.owner->storage & kStoredChildren) == 0) {
+                    deleteList(top.list); // a stored list goes with the store
+                }
+                if (top.owner != this) {
+                    release(top.owner);
+                }
+                depth--;
+                continue;
+            }
+            OxXmlElement* child = top.list->data[top.next++];
+            if (child == nullptr) {
+                continue;
+            }
+            if (child->children == nullptr) {
+                release(child);
+            } else if (depth == kLevels) {
+                child->parent = waiting;
+                waiting = child;
+            } else {
+                open(child);
             }
         }
-        deleteList(list);
-        list = nullptr;
-    };
-    takeChildren(children);
-    while (pending != nullptr) {
-        OxXmlElement* element = pending;
-        pending = element->parent;
-        if (element->children != nullptr) {
-            takeChildren(element->children);
+        if (waiting == nullptr) {
+            return;
         }
-        release(element);
+        OxXmlElement* next = waiting;
+        waiting = next->parent;
+        open(next);
     }
 }
 
@@ -138,33 +170,55 @@ void OxXmlElement::release(OxXmlElement* element) {
     }
 }
 
-void OxXmlElement::moveAttributesToHeap(unsigned int capacity) {
-    OxGList<OxXmlAttribute*>* list = newList<OxXmlAttribute*>(capacity);
-    for (unsigned int i = 0; i < attributes->length; i++) {
-        list->data[i] = attributes->data[i];
+OxXmlPendingAttributes* OxXmlElement::pendingPairs() const {
+    if ((storage & kPendingAttributes) == 0 || pending->kind != OxXmlPendingAttributes::kPairs) {
+        return nullptr;
     }
-    list->length = attributes->length;
-    attributes = list; // the stored list stays with the store
-    storage &= static_cast<std::uint8_t>(~kStoredAttributes);
+    return pending;
+}
+
+void OxXmlElement::buildPendingAttributes() const {
+    // Every allocation comes first: a failure leaves the attributes pending
+    // and the pending form untouched (the CSV form is read only once).
+    unsigned int count = pending->count;
+    OxGList<OxXmlAttribute*>* list = newList<OxXmlAttribute*>(count);
+    unsigned int made = 0;
+    try {
+        for (; made < count; made++) {
+            list->data[made] = new OxXmlAttribute(static_cast<char const*>(nullptr));
+        }
+    } catch (const std::bad_alloc&) {
+        for (unsigned int i = 0; i < made; i++) {
+            delete list->data[i];
+        }
+        deleteList(list);
+        throw;
+    }
+    unsigned int next = 0;
+    pending->forEach([list, &next](char const* attributeName, char* attributeValue) {
+        OxXmlAttribute* attribute = list->data[next++];
+        attribute->name = OxXmlNames::share(attributeName);
+        attribute->value = attributeValue; // a text of the store
+        attribute->storage = OxXmlAttribute::kStoredValue;
+    });
+    list->length = count;
+    // The element is no const object (see the header): its list is made here.
+    auto* self = const_cast<OxXmlElement*>(this);
+    self->attributes = list;
+    self->storage &= static_cast<std::uint8_t>(~kPendingAttributes);
 }
 
 void OxXmlElement::addAttribute(OxXmlAttribute* attribute) {
-    if (attributes == nullptr) {
+    if (attributeList() == nullptr) {
         // Most elements carry one or two attributes: start with one slot.
         attributes = newList<OxXmlAttribute*>(1);
-    } else if ((storage & kStoredAttributes) != 0) {
-        moveAttributesToHeap(attributes->length * 2 + 1);
     }
     attributes->append(attribute);
 }
 
 void OxXmlElement::reserveAttributes(unsigned int count) {
-    if (attributes == nullptr) {
+    if (attributeList() == nullptr) {
         attributes = newList<OxXmlAttribute*>(count);
-    } else if ((storage & kStoredAttributes) != 0) {
-        if (count > attributes->length) {
-            moveAttributesToHeap(count);
-        }
     } else {
         attributes->reserve(count);
     }
@@ -173,6 +227,19 @@ void OxXmlElement::reserveAttributes(unsigned int count) {
 void OxXmlElement::addChild(OxXmlElement* child) {
     if (children == nullptr) {
         children = newList<OxXmlElement*>(4);
+    } else if ((storage & kStoredChildren) != 0) {
+        // A stored list is exact: the list moves to the heap with room to grow.
+        OxGList<OxXmlElement*>* list = newList<OxXmlElement*>(children->length * 2 + 1);
+        try {
+            for (unsigned int i = 0; i < children->length; i++) {
+                list->append(children->data[i]); // within the capacity
+            }
+        } catch (const std::bad_alloc&) {
+            deleteList(list);
+            throw;
+        }
+        children = list;
+        storage &= static_cast<std::uint8_t>(~kStoredChildren);
     }
     children->append(child);
 }
@@ -208,6 +275,9 @@ OxBool OxXmlElement::deleteChildren(char const* childName) {
 }
 
 unsigned int OxXmlElement::getNbAttributes() const {
+    if ((storage & kPendingAttributes) != 0) {
+        return pending->count;
+    }
     return attributes != nullptr ? attributes->length : 0;
 }
 
@@ -216,10 +286,11 @@ unsigned int OxXmlElement::getNbChildElements() const {
 }
 
 OxXmlAttribute* OxXmlElement::getAttribute(unsigned int index) const {
-    if (attributes == nullptr || index >= attributes->length) {
+    OxGList<OxXmlAttribute*>* list = attributeList();
+    if (list == nullptr || index >= list->length) {
         return nullptr;
     }
-    return attributes->data[index];
+    return list->data[index];
 }
 
 OxXmlElement* OxXmlElement::getChild(unsigned int index) const {
@@ -230,11 +301,15 @@ OxXmlElement* OxXmlElement::getChild(unsigned int index) const {
 }
 
 OxXmlAttribute* OxXmlElement::getAttributeByName(char const* attributeName) const {
-    if (attributeName == nullptr || attributes == nullptr) {
+    if (attributeName == nullptr) {
         return nullptr;
     }
-    for (unsigned int i = 0; i < attributes->length; i++) {
-        OxXmlAttribute* attribute = attributes->data[i];
+    OxGList<OxXmlAttribute*>* list = attributeList();
+    if (list == nullptr) {
+        return nullptr;
+    }
+    for (unsigned int i = 0; i < list->length; i++) {
+        OxXmlAttribute* attribute = list->data[i];
         if (attribute != nullptr && sameText(attribute->getName(), attributeName)) {
             return attribute;
         }
@@ -285,7 +360,10 @@ OxBool OxXmlElement::isYes(char const* attributeName) const {
 void OxXmlElement::setName(char const* newName) {
     char const* old = name;
     name = OxXmlNames::acquire(newName);
-    OxXmlNames::release(old);
+    if ((storage & kHeldName) == 0) {
+        OxXmlNames::release(old);
+    }
+    storage &= static_cast<std::uint8_t>(~kHeldName);
 }
 
 void OxXmlElement::setValue(char const* newValue) {
@@ -415,6 +493,9 @@ OxBool OxXmlElement::getPoint(char const* attributeName, OxVec4d& point) const {
     return OxToBool(result >= 0);
 }
 void OxXmlElement::dumpNode(std::ostrstream& stream) const {
+    // Pending attributes are built before anything is written: without
+    // memory the stream gets no part of the node.
+    OxGList<OxXmlAttribute*>* list = attributeList();
     if (name != nullptr) {
         oxIndent(stream) << "XML Element: \"" << name << "\"";
         if (value != nullptr) {
@@ -427,10 +508,10 @@ void OxXmlElement::dumpNode(std::ostrstream& stream) const {
     if (xsiType != nullptr) {
         oxIndent(stream) << "xsi:type : " << xsiType << "\n";
     }
-    if (attributes != nullptr) {
+    if (list != nullptr) {
         OxPrt::adjustIndent(2);
-        for (unsigned int i = 0; i < attributes->length; i++) {
-            OxXmlAttribute* attribute = attributes->data[i];
+        for (unsigned int i = 0; i < list->length; i++) {
+            OxXmlAttribute* attribute = list->data[i];
             if (attribute != nullptr) {
                 oxIndent(stream) << "attribute[" << i << "]:\n";
                 attribute->dump(&stream);

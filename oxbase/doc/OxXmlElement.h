@@ -6,7 +6,8 @@
 // trees of any depth are destroyed, dumped and written without recursion.
 // Names are shared between elements and attributes of equal name, and the
 // elements themselves come from a pool, so that a large document costs
-// little more than its text.
+// little more than its text. The attributes of a read element are built
+// when they are first needed (see "Pending attributes" below).
 //
 //   OxXmlElement * part = new OxXmlElement("part");
 //   part->addAttribute(new OxXmlAttribute("vec3d", OxVec3d(1, 2, 3)));
@@ -26,6 +27,11 @@
 
 class OxXmlFile;
 class OxCsvFile;
+namespace oxbase {
+namespace detail {
+struct OxXmlPendingAttributes;
+} // namespace detail
+} // namespace oxbase
 
 class OXBASE_API OxXmlElement {
 public:
@@ -82,11 +88,13 @@ public:
     char const* getValue() const { return value; }
     char const* getXsiType() const { return xsiType; }
     XML_ELEMENT_TYPE getType() const { return type; }
-    /// List lengths, null slots counted; 0 without a list.
+    /// List lengths, null slots counted; 0 without a list. Builds nothing.
     unsigned int getNbAttributes() const;
     unsigned int getNbChildElements() const;
     /// The entry at `index`, or null (no list, index not below the length,
-    /// or a null slot).
+    /// or a null slot). This and every other operation that hands out or
+    /// changes attributes builds pending ones first (std::bad_alloc when
+    /// that fails, and they stay pending).
     OxXmlAttribute* getAttribute(unsigned int index) const;
     OxXmlElement* getChild(unsigned int index) const;
     /// The first attribute named exactly `attributeName` (case matters), or null.
@@ -138,22 +146,55 @@ public:
     /// dump convention (without recursion). Returns `stream`.
     virtual std::ostrstream* dump(std::ostrstream* stream) const;
 
+    // ---- Pending attributes ----
+    //
+    // The readers leave the attributes of the elements they build pending:
+    // recorded compactly in the document's store, counted, but not yet
+    // objects (oxbase/doc/detail/OxXmlPendingAttributes.h). The first call
+    // that needs them as objects builds all of them at once, in list order,
+    // with the names and values they were read with; from then on they are
+    // ordinary attributes, and each pointer handed out stays valid as long
+    // as its attribute does. Building them is invisible but for its cost and
+    // for std::bad_alloc, which leaves them pending. Const getters build
+    // too: the objects are part of the element's state, not a change of it.
+
 private:
     friend class OxXmlFile;
     friend class OxCsvFile;
     friend class oxbase::detail::OxXmlStore;
     /// Where the object and its parts live: bits of `storage`. A stored
     /// element was built by a document's store (OxXmlStore) and goes with
-    /// it; a stored value is a text there, and a stored attribute list an
-    /// exact array there. Setters and addAttribute move what they change to
-    /// the heap, so callers see no difference.
-    enum : std::uint8_t { kStoredNode = 1, kStoredValue = 2, kStoredAttributes = 4 };
+    /// it; a stored value is a text there, which setValue replaces by a heap
+    /// copy, so callers see no difference. With pending attributes `pending`
+    /// is set instead of `attributes`; built attributes come from the heap
+    /// and keep their values in the store. A stored child list is an exact
+    /// array there, moved to the heap by addChild. A held name is one whose
+    /// use the store holds for the element (setName takes a use of its own).
+    enum : std::uint8_t {
+        kStoredNode = 1,
+        kStoredValue = 2,
+        kPendingAttributes = 4,
+        kStoredChildren = 8,
+        kHeldName = 16
+    };
     /// Destroys `element` and its subtree as their storage requires (null is
     /// ignored): the way a document and a parent end the nodes they own.
     static void release(OxXmlElement* element);
-    /// Gives the attribute list a heap array of `capacity` slots (at least
-    /// its length) instead of its stored one.
-    void moveAttributesToHeap(unsigned int capacity);
+    /// The attribute list, pending attributes built first (std::bad_alloc
+    /// when that fails, and they stay pending); null without attributes.
+    OxGList<OxXmlAttribute*>* attributeList() const {
+        if ((storage & kPendingAttributes) != 0) {
+            buildPendingAttributes();
+        }
+        return attributes;
+    }
+    /// The pending attributes when they are the pairs of a read XML tag
+    /// (null otherwise), for the writer, which writes them as they stand.
+    oxbase::detail::OxXmlPendingAttributes* pendingPairs() const;
+    /// Turns the pending attributes into objects in a list of their own.
+    /// The element is never a const object: only the store makes pending
+    /// attributes, on the elements it builds.
+    void buildPendingAttributes() const;
     /// Reads up to `count` numbers of attribute `attributeName` into `numbers`.
     /// 1: all found; 0: attribute or value missing; -1: too few or no copy.
     int readNumbers(char const* attributeName, double* numbers, unsigned int count) const;
@@ -167,7 +208,10 @@ private:
     char* value = nullptr;
     OxXmlElement* parent = nullptr;
     OxGList<OxXmlElement*>* children = nullptr;
-    OxGList<OxXmlAttribute*>* attributes = nullptr;
+    union {
+        OxGList<OxXmlAttribute*>* attributes = nullptr;
+        oxbase::detail::OxXmlPendingAttributes* pending; ///< with kPendingAttributes
+    };
 };
 
 #endif

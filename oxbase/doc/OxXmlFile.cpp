@@ -4,6 +4,7 @@
 #include "oxbase/core/detail/OxNoMemory.h"
 #include "oxbase/diag/OxMsg.h"
 #include "oxbase/diag/OxMsgNumbers.h"
+#include "oxbase/doc/detail/OxXmlPendingAttributes.h"
 #include "oxbase/doc/detail/OxXmlReader.h"
 #include "oxbase/doc/detail/OxXmlStore.h"
 #include "oxbase/doc/detail/OxXmlTextBuffer.h"
@@ -99,11 +100,15 @@ public:
     /// ` name="value"` of an attribute with a value, as OxXmlAttribute::write
     /// puts it; nothing for one without. False for an attribute without name.
     bool addAttribute(OxXmlAttribute const& attribute) {
-        if (attribute.getName() == nullptr) {
+        return addAttribute(attribute.getName(), attribute.getValue());
+    }
+    /// The same for an attribute of that name and value.
+    bool addAttribute(char const* name, char const* value) {
+        if (name == nullptr) {
             return false;
         }
-        if (attribute.getValue() != nullptr) {
-            add(' ').add(attribute.getName()).add('=').add('"').add(attribute.getValue()).add('"');
+        if (value != nullptr) {
+            add(' ').add(name).add('=').add('"').add(value).add('"');
         }
         return true;
     }
@@ -312,12 +317,17 @@ OxBool OxXmlFile::writeFile() {
     }
     OxBool result = OxFalse;
     std::unique_ptr<OxXmlLineSink> sink;
+    short indentBefore = curpos;
     if (!withMemory([&] {
             sink.reset(new OxXmlLineSink(*output, flushEveryLine != OxFalse));
             result = writeDocument(*sink);
         })) {
         reportNoMemory(); // the lines finished so far still go to the file
         result = OxFalse;
+        // The attributes of an element are built when it is written, so
+        // memory may run out deep in the tree: the indentation goes back to
+        // where the document began.
+        setIndent(indentBefore);
     }
     if (sink != nullptr) {
         sink->finish();
@@ -416,9 +426,18 @@ OxBool OxXmlFile::write(OxXmlElement const* element, OxXmlLineSink& sink) {
             line.send(sink);
             return Done;
         }
-        for (unsigned int i = 0; i < node->getNbAttributes(); i++) {
-            OxXmlAttribute const* attribute = node->getAttribute(i);
-            if (attribute != nullptr && !line.addAttribute(*attribute)) {
+        // The attributes of a read tag that nobody asked for are written as
+        // they were read, without building them (see OxXmlElement).
+        OxXmlPendingAttributes* tag = node->pendingPairs();
+        unsigned int count = node->getNbAttributes();
+        for (unsigned int i = 0; i < count; i++) {
+            bool named = true;
+            if (tag != nullptr) {
+                named = line.addAttribute(tag->pairs()[i].name, tag->pairs()[i].value);
+            } else if (OxXmlAttribute const* attribute = node->getAttribute(i)) {
+                named = line.addAttribute(*attribute);
+            }
+            if (!named) {
                 line.discard(); // the line in progress is not sent
                 return Failed;
             }

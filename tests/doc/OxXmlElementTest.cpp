@@ -188,3 +188,38 @@ TEST(OxXmlElementTest, DumpText) {
                              "<!-- n -->\n");
     EXPECT_EQ(OxPrt::getIndent(), 0);
 }
+
+namespace {
+/// An element that counts its destructions.
+class Counted : public OxXmlElement {
+public:
+    explicit Counted(const char* name) : OxXmlElement(name) { alive++; }
+    ~Counted() override { alive--; }
+    Counted(const Counted&) = delete;
+    Counted& operator=(const Counted&) = delete;
+    static int alive;
+};
+int Counted::alive = 0;
+} // namespace
+
+TEST(OxXmlElementTree, EveryElementOfAWideDeepTreeIsDestroyedOnce) {
+    // 70 levels (beyond what the destructor keeps on its own stack), each
+    // with a leaf, a null slot and a subtree; some levels of mixed kinds.
+    {
+        auto root = std::make_unique<OxXmlElement>("root");
+        OxXmlElement* level = root.get();
+        for (int depth = 0; depth < 70; depth++) {
+            OxXmlElement* leaf = depth % 3 == 0 ? new Counted("leaf") : new OxXmlElement("leaf");
+            level->addChild(leaf);
+            level->addChild(new Counted("gone"));
+            level->deleteChild(level->getNbChildElements() - 1);
+            OxXmlElement* next = new Counted("level");
+            level->addChild(next);
+            next->setParent(level);
+            next->addChild(new Counted("side"));
+            level = next;
+        }
+        EXPECT_EQ(Counted::alive, 24 + 70 + 70);
+    }
+    EXPECT_EQ(Counted::alive, 0);
+}

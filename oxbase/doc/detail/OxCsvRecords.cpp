@@ -1,7 +1,6 @@
 #include "oxbase/doc/detail/OxCsvRecords.h"
 
 #include "oxbase/core/detail/OxNoMemory.h"
-#include "oxbase/doc/OxXmlAttribute.h"
 #include "oxbase/doc/OxXmlElement.h"
 #include "oxbase/doc/detail/OxXmlNames.h"
 #include "oxbase/doc/detail/OxXmlStore.h"
@@ -14,62 +13,60 @@ namespace detail {
 
 OxCsvRecords::OxCsvRecords(OxXmlStore& recordStore, OxXmlElement& recordRoot,
                            OxGList<char*> const& columnNames, char fieldSeparator)
-    : store(recordStore), root(recordRoot), columns(columnNames), separator(fieldSeparator) {
-    // Last: the lists above are destroyed should this fail.
-    recordName = OxXmlNames::acquire("record", 6);
+    : store(recordStore), root(recordRoot), header(columnNames), separator(fieldSeparator) {
+    columns = store.newColumns(separator);
+    recordName = store.holdText("record");
 }
 
-OxCsvRecords::~OxCsvRecords() {
-    for (unsigned int i = 0; i < fields.length; i++) {
-        OxXmlStore::discard(fields.data[i]);
-    }
-    for (unsigned int i = 0; i < names.length; i++) {
-        OxXmlNames::release(names.data[i]);
-    }
-    OxXmlNames::release(recordName);
-}
-
-char const* OxCsvRecords::columnName(unsigned int position) {
-    while (names.length <= position) {
-        known.reserve(names.length + 1);
-        names.append(nullptr);
-        known.append(false);
-    }
-    if (!known.data[position]) {
-        if (position < columns.getLength()) {
-            names.data[position] = OxXmlNames::acquire(columns.data[position]);
+void OxCsvRecords::cover(unsigned int positions) {
+    OxGList<char const*>& names = columns->names;
+    while (names.length < positions) {
+        unsigned int position = names.length;
+        names.reserve(position + 1);
+        if (position < header.length) {
+            names.append(store.holdText(header.data[position]));
         } else {
             char generated[24];
             std::snprintf(generated, sizeof generated, "column%u", position);
-            names.data[position] = OxXmlNames::acquire(generated);
+            names.append(store.holdText(generated));
         }
-        known.data[position] = true;
     }
-    return names.data[position];
 }
 
-void OxCsvRecords::take(char* line) {
-    OxXmlElement* record = store.newElementShared(recordName);
-    if (!withMemory([&] { root.addChild(record); })) {
+void OxCsvRecords::take(char const* line, std::size_t length) {
+    // Count the non-empty fields and find the last one's position: the
+    // columns must name it before any record refers to it.
+    unsigned int count = 0;
+    unsigned int position = 0;
+    unsigned int covered = 0;
+    std::size_t fieldLength = 0;
+    for (std::size_t i = 0; i < length; i++) {
+        if (line[i] != separator) {
+            fieldLength++;
+            continue;
+        }
+        if (fieldLength != 0) {
+            count++;
+            covered = position + 1;
+        }
+        fieldLength = 0;
+        position++;
+    }
+    if (fieldLength != 0) {
+        count++;
+        covered = position + 1;
+    }
+    cover(covered);
+    OxXmlElement* record = store.newElementHeld(recordName);
+    bool placed = withMemory([&] {
+        store.setPendingLine(record, columns, count, line, length);
+        root.addChild(record);
+    });
+    if (!placed) {
         OxXmlStore::discard(record);
         throw std::bad_alloc();
     }
     record->setParent(&root);
-    unsigned int position = 0;
-    splitCsvFields(line, separator, [this, &position](char* start, std::size_t length, bool) {
-        if (length != 0) {
-            char const* name = columnName(position);
-            OxXmlAttribute* field = store.newAttributeShared(name);
-            if (!withMemory([&] { fields.append(field); })) {
-                OxXmlStore::discard(field);
-                throw std::bad_alloc();
-            }
-            store.setValue(field, start, length);
-        }
-        position++;
-    });
-    store.addAttributes(record, fields.data, fields.length);
-    fields.length = 0; // the record has them
 }
 
 } // namespace detail

@@ -19,7 +19,8 @@
 namespace oxbase {
 namespace detail {
 
-/// The lines of a text-mode input, whole, whatever their length.
+/// The lines of a text-mode input, whole, whatever their length. Eight bytes
+/// behind the end of each line handed out may be read (not written).
 ///
 /// One buffer serves the whole file: blocks are read into it behind the
 /// unfinished line, a finished line is handed out in place, and the buffer
@@ -38,7 +39,7 @@ public:
     void start(long long length) {
         remaining = length > 0 ? length : 0;
         capacity = kInitialCapacity;
-        buffer = new char[capacity];
+        buffer = newBuffer(capacity);
     }
 
     /// The next line without its line end, in place: `line` and `length`.
@@ -50,6 +51,7 @@ public:
                 line = buffer + lineStart;
                 length = static_cast<size_t>(found - line);
                 lineStart = scan = static_cast<size_t>(found - buffer) + 1;
+                passNul();
                 return Line;
             }
             scan = filled;
@@ -59,6 +61,7 @@ public:
                     line = buffer + lineStart;
                     length = filled - lineStart;
                     lineStart = scan = filled;
+                    passNul();
                     return Line;
                 }
                 return End;
@@ -70,8 +73,33 @@ public:
         }
     }
 
+    /// Whether the line last handed out may hold a NUL byte (no line
+    /// without one is ever said to).
+    bool lineMayHoldNul() const { return lastLineNul; }
+
 private:
+    static constexpr size_t kNone = static_cast<size_t>(-1);
+    /// Bytes behind the buffer's capacity that may be read (never used for
+    /// text), so that a reader may load a whole word at any place of a line.
+    static constexpr size_t kSlack = 8;
+
+    static char* newBuffer(size_t size) {
+        char* memory = new char[size + kSlack];
+        std::memset(memory + size, 0, kSlack);
+        return memory;
+    }
     static constexpr size_t kInitialCapacity = 64 * 1024;
+
+    /// Notes whether the line that ends before `lineStart` holds the next
+    /// NUL byte, and finds the one behind it. Each byte is searched once.
+    void passNul() {
+        lastLineNul = nulAt < lineStart;
+        if (lastLineNul) {
+            auto* next =
+                static_cast<char*>(std::memchr(buffer + lineStart, '\0', filled - lineStart));
+            nulAt = next != nullptr ? static_cast<size_t>(next - buffer) : kNone;
+        }
+    }
     static constexpr size_t kMinimumRead = 16 * 1024;
     static constexpr size_t kMaximumRead = 1u << 30;
 
@@ -80,10 +108,13 @@ private:
             std::memmove(buffer, buffer + lineStart, filled - lineStart);
             filled -= lineStart;
             scan -= lineStart;
+            if (nulAt != kNone) {
+                nulAt -= lineStart;
+            }
             lineStart = 0;
         }
         if (capacity - 1 - filled < kMinimumRead) {
-            char* bigger = new char[capacity * 2];
+            char* bigger = newBuffer(capacity * 2);
             std::memcpy(bigger, buffer, filled);
             delete[] buffer;
             buffer = bigger;
@@ -108,6 +139,11 @@ private:
         } else {
             remaining -= got;
         }
+        if (nulAt == kNone && got > 0) {
+            auto* nul =
+                static_cast<char*>(std::memchr(buffer + filled, '\0', static_cast<size_t>(got)));
+            nulAt = nul != nullptr ? static_cast<size_t>(nul - buffer) : kNone;
+        }
         filled += static_cast<size_t>(got);
         return Line;
     }
@@ -124,6 +160,8 @@ private:
     size_t filled = 0;
     size_t lineStart = 0;
     size_t scan = 0;
+    size_t nulAt = kNone; ///< the first NUL byte at or behind lineStart, if any
+    bool lastLineNul = false;
 };
 
 } // namespace detail

@@ -45,6 +45,16 @@ public:
         }
         return std::isspace(code) != 0;
     }
+    /// Narrows [begin, end) to its text without white space (isWhite) at
+    /// either end, as OxString::stripWhite trims, without moving anything.
+    template <class Char> static void trim(Char*& begin, Char*& end) {
+        while (begin < end && isWhite(*begin)) {
+            begin++;
+        }
+        while (end > begin && isWhite(end[-1])) {
+            end--;
+        }
+    }
 };
 
 } // namespace detail

@@ -10,12 +10,51 @@
 #include "oxbase/io/OxInput.h"
 
 #include <cctype>
+#include <cstdint>
 #include <cstring>
 #include <iostream>
 #include <memory>
 
 namespace oxbase {
 namespace detail {
+
+namespace {
+/// What ends a name inside a tag, by character: kTagName a tag name (a blank,
+/// "/", ">"), kAttributeName an attribute name (those and "="). Both end at
+/// the NUL that the reader puts behind each line, so a scan needs no bound.
+enum : unsigned char { kTagName = 1, kAttributeName = 2 };
+struct NameEnds {
+    unsigned char of[256] = {};
+    constexpr NameEnds() {
+        of[static_cast<unsigned char>(' ')] = kTagName | kAttributeName;
+        of[static_cast<unsigned char>('/')] = kTagName | kAttributeName;
+        of[static_cast<unsigned char>('>')] = kTagName | kAttributeName;
+        of[0] = kTagName | kAttributeName;
+        of[static_cast<unsigned char>('=')] = kAttributeName;
+    }
+    bool ends(char c, unsigned char kind) const {
+        return (of[static_cast<unsigned char>(c)] & kind) != 0;
+    }
+};
+constexpr NameEnds kNameEnds;
+
+/// The bits of the first n characters of a text loaded as a 64-bit number,
+/// n below 8, whatever the byte order.
+struct HeadMasks {
+    std::uint64_t of[8] = {};
+    HeadMasks() {
+        for (unsigned int n = 0; n < 8; n++) {
+            unsigned char bytes[8] = {};
+            for (unsigned int i = 0; i < n; i++) {
+                bytes[i] = 0xFF;
+            }
+            std::memcpy(&of[n], bytes, sizeof bytes);
+        }
+    }
+    std::uint64_t operator[](size_t n) const { return of[n]; }
+};
+const HeadMasks kHeadMask;
+} // namespace
 
 OxXmlReader::NameCache::~NameCache() {
     for (Entry& entry : slots) {
@@ -28,31 +67,41 @@ char const* OxXmlReader::NameCache::lookup(char const* text, size_t length) {
     if (length == 0) {
         return nullptr;
     }
-    size_t slot = (length * 31 + static_cast<unsigned char>(text[0]) +
-                   static_cast<unsigned char>(text[length - 1]) * 7) %
-                  kSlots;
-    Entry& entry = slots[slot];
-    if (entry.raw != nullptr && entry.length == length &&
-        std::memcmp(entry.raw, text, length) == 0) {
+    // The first eight characters as a number: with the length it picks the
+    // slot and tells most names apart without a comparison of texts.
+    // (The line source keeps eight readable bytes behind every line.)
+    std::uint64_t key = 0;
+    std::memcpy(&key, text, sizeof key);
+    if (length < 8) {
+        key &= kHeadMask[length];
+    }
+    Entry& entry = slots[(((key ^ length) * 0x9E3779B97F4A7C15ULL) >> 56) % kSlots];
+    // (An empty entry has the length 0, which no name has.)
+    if (entry.key == key && entry.length == length &&
+        (length <= 8 || std::memcmp(entry.raw + 8, text + 8, length - 8) == 0)) {
         return entry.shared;
     }
+    return fill(entry, text, length, key);
+}
+
+char const* OxXmlReader::NameCache::fill(Entry& entry, char const* text, size_t length,
+                                         std::uint64_t key) {
     // A new name: its shared text and a copy of the raw text first, so that
     // the entry is replaced only when both are there.
     std::unique_ptr<char[]> raw(new char[length]);
     std::memcpy(raw.get(), text, length);
     char const* shared = OxXmlNames::acquire(text, length);
+    if (!withMemory([&] { store.holdName(shared); })) {
+        OxXmlNames::release(shared);
+        throw std::bad_alloc();
+    }
     delete[] entry.raw;
     OxXmlNames::release(entry.shared);
     entry.raw = raw.release();
+    entry.key = key;
     entry.length = length;
     entry.shared = shared;
     return shared;
-}
-
-OxXmlReader::~OxXmlReader() {
-    for (unsigned int i = 0; i < tagAttributes.length; i++) {
-        OxXmlStore::discard(tagAttributes.data[i]);
-    }
 }
 
 OxBool OxXmlReader::run() {
@@ -74,24 +123,23 @@ OxBool OxXmlReader::run() {
             break;
         }
         lineNumber++;
-        // A NUL byte cannot stand in a text: it is read as a blank.
-        unsigned int nuls = 0;
-        for (char* nul = static_cast<char*>(std::memchr(line, '\0', length)); nul != nullptr;
-             nul = static_cast<char*>(std::memchr(nul, '\0', length - (nul - line)))) {
-            *nul = ' ';
-            nuls++;
-        }
-        if (nuls > 0) {
-            OxMsg::Log(OxMsgXmlNulBytes, fileName(), lineNumber, nuls);
+        // A NUL byte cannot stand in a text: it is read as a blank. (The
+        // scanners below also rely on the NUL behind the line being the
+        // only one.)
+        if (source.lineMayHoldNul()) {
+            unsigned int nuls = 0;
+            for (char* nul = static_cast<char*>(std::memchr(line, '\0', length)); nul != nullptr;
+                 nul = static_cast<char*>(std::memchr(nul, '\0', length - (nul - line)))) {
+                *nul = ' ';
+                nuls++;
+            }
+            if (nuls > 0) {
+                OxMsg::Log(OxMsgXmlNulBytes, fileName(), lineNumber, nuls);
+            }
         }
         char* begin = line;
         char* end = line + length;
-        while (begin < end && OxXmlNames::isWhite(*begin)) {
-            begin++;
-        }
-        while (end > begin && OxXmlNames::isWhite(end[-1])) {
-            end--;
-        }
+        OxXmlNames::trim(begin, end);
         if (begin == end) {
             continue; // a blank line adds nothing in any state
         }
@@ -160,7 +208,7 @@ int OxXmlReader::doStart() {
 }
 
 int OxXmlReader::doContent() {
-    char* open = find(cursor, '<');
+    char* open = *cursor == '<' ? cursor : find(cursor, '<');
     if (open == nullptr) {
         cursor = lineEnd; // text between elements is ignored
         return kGoOn;
@@ -189,7 +237,7 @@ int OxXmlReader::doContent() {
         nameBegin++;
     }
     char* nameEnd = nameBegin;
-    while (nameEnd < lineEnd && *nameEnd != ' ' && *nameEnd != '/' && *nameEnd != '>') {
+    while (!kNameEnds.ends(*nameEnd, kTagName)) {
         nameEnd++;
     }
     if (nameEnd == lineEnd) {
@@ -207,13 +255,17 @@ int OxXmlReader::doContent() {
             return OxMsgXmlBadTagEnd;
         }
         createElement(open, nameBegin, nameEnd, false);
-        cursor = nameEnd + 1;
+        cursor = nameEnd + 2; // CONTENT would skip the ">" as text
         return kGoOn;
     }
     createElement(open, nameBegin, nameEnd, true);
-    state = *nameEnd == '>' ? ELEMENT_VALUE : ATTRIBUTE;
     cursor = nameEnd + 1;
-    return kGoOn;
+    if (*nameEnd == '>') {
+        state = ELEMENT_VALUE;
+        return kGoOn;
+    }
+    state = ATTRIBUTE;
+    return cursor < lineEnd ? doAttribute() : kGoOn;
 }
 
 int OxXmlReader::doElementValue() {
@@ -242,75 +294,101 @@ int OxXmlReader::doElementValue() {
 }
 
 int OxXmlReader::doAttribute() {
-    skipBlanks();
-    char* nameBegin = cursor;
-    while (cursor < lineEnd && *cursor != ' ' && *cursor != '/' && *cursor != '=' &&
-           *cursor != '>') {
-        cursor++;
-    }
-    char* nameEnd = cursor;
-    skipBlanks();
-    if (cursor == lineEnd) {
-        return kGoOn; // the tag goes on on the next line
-    }
-    switch (*cursor) {
-    case '/':
-        if (cursor[1] != '>') {
-            return OxMsgXmlBadTagEnd;
+    // One pass over the attributes of the line, the cursor in a local while
+    // names are scanned, until the tag ends, the line does, or a value does
+    // not close on its line. The states and cursors left behind are those of
+    // a step per state.
+    char* p = cursor;
+    for (;;) {
+        while (*p == ' ') {
+            p++;
         }
-        commitAttributes();
-        if (current != nullptr) {
-            current = current->getParent();
+        char* nameBegin = p;
+        while (!kNameEnds.ends(*p, kAttributeName)) {
+            p++;
         }
-        cursor++;
-        state = CONTENT;
-        return kGoOn;
-    case '=':
-        attribute = nullptr;
-        if (current != nullptr) {
-            if (tagElement != current) {
-                commitAttributes();
-                tagElement = current;
+        char* nameEnd = p;
+        while (*p == ' ') {
+            p++;
+        }
+        cursor = p;
+        if (p == lineEnd) {
+            return kGoOn; // the tag goes on on the next line
+        }
+        switch (*p) {
+        case '/':
+            if (p[1] != '>') {
+                return OxMsgXmlBadTagEnd;
             }
-            OxXmlAttribute* made = store.newAttributeShared(
-                names.lookup(nameBegin, static_cast<size_t>(nameEnd - nameBegin)));
-            if (!withMemory([&] { tagAttributes.append(made); })) {
-                OxXmlStore::discard(made);
-                throw std::bad_alloc();
+            commitAttributes();
+            if (current != nullptr) {
+                closeCurrent();
             }
-            attribute = made; // its element gets it at the tag's end; its value comes next
+            cursor = p + 2; // CONTENT would skip the ">" as text
+            state = CONTENT;
+            return kGoOn;
+        case '=': {
+            openAttribute(nameBegin, nameEnd);
+            cursor = p + 1;
+            state = ATTRIBUTE_VALUE;
+            int outcome = doAttributeValue();
+            if (outcome != kGoOn || state != ATTRIBUTE) {
+                return outcome; // an error, or a value that goes on
+            }
+            p = cursor;
+            continue;
         }
-        cursor++;
-        state = ATTRIBUTE_VALUE;
-        return kGoOn;
-    case '>':
-        commitAttributes();
-        cursor++;
-        state = ELEMENT_VALUE;
-        return kGoOn;
-    default:
-        return kGoOn; // a name without "=" is dropped
+        case '>':
+            commitAttributes();
+            cursor = p + 1;
+            state = ELEMENT_VALUE;
+            return kGoOn;
+        default:
+            continue; // a name without "=" is dropped
+        }
     }
 }
 
+void OxXmlReader::openAttribute(char* nameBegin, char* nameEnd) {
+    attributeOpen = false;
+    if (current == nullptr) {
+        return;
+    }
+    if (tagElement != current) {
+        commitAttributes();
+        tagElement = current;
+    }
+    OxXmlPendingPair pair{names.lookup(nameBegin, static_cast<size_t>(nameEnd - nameBegin)),
+                          nullptr};
+    tagPairs.append(pair);
+    // Its element gets it at the tag's end; its value comes next.
+    attribute = tagPairs.length - 1;
+    attributeOpen = true;
+}
+
 int OxXmlReader::doAttributeValue() {
-    skipBlanks();
-    if (cursor == lineEnd) {
+    char* p = cursor;
+    while (*p == ' ') { // the NUL behind the line stops it
+        p++;
+    }
+    cursor = p;
+    if (p == lineEnd) {
         return kGoOn;
     }
-    if (*cursor != '"' && *cursor != '\'') {
+    char open = *p;
+    if (open != '"' && open != '\'') {
         return OxMsgXmlNoQuote;
     }
-    quote = *cursor++;
-    char* close = find(cursor, quote);
+    quote = open;
+    p++;
+    auto* close = static_cast<char*>(std::memchr(p, open, static_cast<size_t>(lineEnd - p)));
     if (close != nullptr) {
-        if (attribute != nullptr) {
-            store.setValue(attribute, cursor, static_cast<size_t>(close - cursor));
-        }
+        setAttributeValue(p, static_cast<size_t>(close - p));
         cursor = close + 1;
         state = ATTRIBUTE;
         return kGoOn;
     }
+    cursor = p;
     // The value goes on on the next lines; each line end becomes one blank.
     // A quote that ends its line leaves nothing to gather, and the value then
     // fails at its closing quote.
@@ -341,9 +419,7 @@ int OxXmlReader::doAttributeValueMore() {
         return kAbort;
     }
     gathered.append(cursor, static_cast<size_t>(close - cursor));
-    if (attribute != nullptr) {
-        store.setValue(attribute, gathered.text(), gathered.size());
-    }
+    setAttributeValue(gathered.text(), gathered.size());
     gathered.clear();
     cursor = close + 1;
     state = ATTRIBUTE;
@@ -410,15 +486,14 @@ int OxXmlReader::doDoctype() {
 void OxXmlReader::createElement(char* tagStart, char* nameBegin, char* nameEnd, bool makeCurrent) {
     commitAttributes();
     OxXmlElement* element =
-        store.newElementShared(names.lookup(nameBegin, static_cast<size_t>(nameEnd - nameBegin)));
+        store.newElementHeld(names.lookup(nameBegin, static_cast<size_t>(nameEnd - nameBegin)));
     // Until a place in the document has it, the element is destroyed when
     // memory runs out.
     bool placed = withMemory([&] {
         if (file.root == nullptr) {
             file.root = element;
         } else if (current != nullptr) {
-            current->addChild(element);
-            element->setParent(current);
+            addToCurrent(element);
         } else {
             // A second element at top level has no parent to go to: it is
             // kept behind the root, where the writer writes it back.
@@ -432,7 +507,7 @@ void OxXmlReader::createElement(char* tagStart, char* nameBegin, char* nameEnd, 
         throw std::bad_alloc();
     }
     if (makeCurrent) {
-        current = element;
+        openElement(element);
     }
 }
 
@@ -452,7 +527,7 @@ void OxXmlReader::closeByEndTag(char* tagStart, char* nameBegin) {
                        openName);
         });
     }
-    current = current->getParent();
+    closeCurrent();
 }
 
 void OxXmlReader::attach(OxXmlElement* node) {
@@ -460,8 +535,7 @@ void OxXmlReader::attach(OxXmlElement* node) {
         return;
     }
     if (current != nullptr) {
-        current->addChild(node);
-        node->setParent(current);
+        addToCurrent(node);
     } else if (file.root == nullptr) {
         file.preRootNodes.append(node);
     } else {
@@ -470,11 +544,12 @@ void OxXmlReader::attach(OxXmlElement* node) {
 }
 
 void OxXmlReader::commitAttributes() {
-    if (tagAttributes.length > 0 && tagElement != nullptr) {
-        store.addAttributes(tagElement, tagAttributes.data, tagAttributes.length);
+    if (tagPairs.length > 0 && tagElement != nullptr) {
+        store.setPendingPairs(tagElement, tagPairs.data, tagPairs.length);
     }
-    tagAttributes.length = 0;
+    tagPairs.length = 0;
     tagElement = nullptr;
+    attributeOpen = false;
 }
 
 void OxXmlReader::finishComment(bool cdata) {
@@ -494,8 +569,8 @@ void OxXmlReader::finishComment(bool cdata) {
 
 void OxXmlReader::finish() {
     // What stands open at the end keeps what was gathered.
-    if (gathering && gatheredValid && attribute != nullptr) {
-        store.setValue(attribute, gathered.text(), gathered.size());
+    if (gathering && gatheredValid) {
+        setAttributeValue(gathered.text(), gathered.size());
     }
     commitAttributes();
     if (commentOpen[0]) {
@@ -507,6 +582,36 @@ void OxXmlReader::finish() {
     if (doctypeLoaded && file.doctype != nullptr) {
         file.doctype->setValue(doctypeText.text());
     }
+    while (current != nullptr) {
+        closeCurrent(); // the elements still open get their children
+    }
+}
+
+OxXmlReader::~OxXmlReader() {
+    // Children not yet handed to their element (a read left by
+    // std::bad_alloc) have no other owner.
+    for (unsigned int i = 0; i < openChildren.length; i++) {
+        OxXmlStore::discard(openChildren.data[i]);
+    }
+}
+
+void OxXmlReader::openElement(OxXmlElement* element) {
+    frames.append(Frame{element, openChildren.length});
+    current = element;
+}
+
+void OxXmlReader::closeCurrent() {
+    Frame frame = frames.data[frames.length - 1];
+    unsigned int count = openChildren.length - frame.first;
+    store.setChildren(frame.element, openChildren.data + frame.first, count);
+    openChildren.length = frame.first;
+    frames.length--;
+    current = frames.length > 0 ? frames.data[frames.length - 1].element : nullptr;
+}
+
+void OxXmlReader::addToCurrent(OxXmlElement* node) {
+    openChildren.append(node);
+    node->setParent(current);
 }
 
 } // namespace detail

@@ -7,13 +7,14 @@
 
 #include "oxbase/doc/OxXmlFile.h"
 #include "oxbase/doc/detail/OxXmlLineSource.h"
+#include "oxbase/doc/detail/OxXmlPendingAttributes.h"
 #include "oxbase/doc/detail/OxXmlStore.h"
 #include "oxbase/doc/detail/OxXmlTextBuffer.h"
 
 #include <cstddef>
+#include <cstdint>
 #include <cstring>
 
-class OxXmlAttribute;
 class OxXmlElement;
 
 namespace oxbase {
@@ -46,7 +47,9 @@ class OxXmlReader {
     /// name; the cache gives them back at its end.
     class NameCache {
     public:
-        NameCache() = default;
+        /// Every name new to the cache is also held by `store`, for the
+        /// pending attributes that refer to it.
+        explicit NameCache(OxXmlStore& nameStore) : store(nameStore) {}
         NameCache(const NameCache&) = delete;
         NameCache& operator=(const NameCache&) = delete;
         ~NameCache();
@@ -57,10 +60,16 @@ class OxXmlReader {
     private:
         struct Entry {
             char const* raw = nullptr; ///< the raw text, a copy owned here
+            std::uint64_t key = 0;     ///< its first eight characters
             size_t length = 0;
             char const* shared = nullptr;
         };
-        static constexpr size_t kSlots = 64;
+        /// Puts the name [text, text + length) into `entry`, its slot.
+        char const* fill(Entry& entry, char const* text, size_t length, std::uint64_t key);
+        /// Slots by the length and the first eight characters: the few
+        /// dozen names of a document rarely meet in one slot.
+        static constexpr size_t kSlots = 256;
+        OxXmlStore& store;
         Entry slots[kSlots];
     };
 
@@ -68,10 +77,10 @@ public:
     /// Reads into `document`, whose store must exist: elements, attributes
     /// and their values are built there.
     explicit OxXmlReader(OxXmlFile& document)
-        : file(document), store(*document.store), source(*document.input) {}
+        : file(document), store(*document.store), names(*document.store), source(*document.input) {}
     OxXmlReader(const OxXmlReader&) = delete;
     OxXmlReader& operator=(const OxXmlReader&) = delete;
-    /// Attributes not yet handed to their element (a read left by
+    /// Children not yet handed to their element (a read left by
     /// std::bad_alloc) are destroyed.
     ~OxXmlReader();
 
@@ -125,8 +134,26 @@ private:
     void createElement(char* tagStart, char* nameBegin, char* nameEnd, bool makeCurrent);
     void closeByEndTag(char* tagStart, char* nameBegin);
     void attach(OxXmlElement* node);
+    /// `element` becomes the current element; its children are gathered
+    /// until it closes.
+    void openElement(OxXmlElement* element);
+    /// Closes the current element: it gets its children as one exact list
+    /// in the store, and its parent becomes the current element.
+    void closeCurrent();
+    /// Adds `node` to the children of the current element (there is one).
+    void addToCurrent(OxXmlElement* node);
     /// Hands the attributes of the tag in progress to their element.
     void commitAttributes();
+    /// Opens the attribute [nameBegin, nameEnd) of the current element (none
+    /// without one): the attribute in progress, its value to come.
+    void openAttribute(char* nameBegin, char* nameEnd);
+
+    /// Gives the attribute in progress the value [text, text + length).
+    void setAttributeValue(char const* text, size_t length) {
+        if (attributeOpen) {
+            tagPairs.data[attribute].value = store.copyValue(text, length);
+        }
+    }
     void finishComment(bool cdata);
     void finish();
     static char const* nameOrEmpty(char const* text) { return text != nullptr ? text : ""; }
@@ -143,6 +170,14 @@ private:
     char* cursor = nullptr;
 
     OxXmlElement* current = nullptr;
+    // The open elements, outermost first, each with the place of its first
+    // child in openChildren: the children of all of them, in order.
+    struct Frame {
+        OxXmlElement* element;
+        unsigned int first;
+    };
+    OxGList<Frame> frames;
+    OxGList<OxXmlElement*> openChildren;
     // Comment and CDATA in progress: the node and its text so far.
     bool commentOpen[2] = {false, false};
     OxXmlElement* commentNode[2] = {nullptr, nullptr};
@@ -150,12 +185,14 @@ private:
     // The DOCTYPE text: gathered over the whole read, stored at its end.
     bool doctypeLoaded = false;
     OxXmlTextBuffer doctypeText;
-    // The attributes of the tag in progress, handed to their element at the
-    // tag's end as one exact list.
+    // The attributes of the tag in progress (names and stored values),
+    // handed to their element at the tag's end as its pending attributes.
     OxXmlElement* tagElement = nullptr;
-    OxGList<OxXmlAttribute*> tagAttributes;
-    // The attribute in progress and its value gathered over several lines.
-    OxXmlAttribute* attribute = nullptr;
+    OxGList<OxXmlPendingPair> tagPairs;
+    // The attribute in progress (an entry of tagPairs) and its value
+    // gathered over several lines.
+    bool attributeOpen = false;
+    unsigned int attribute = 0;
     char quote = '"';
     bool gatheredValid = false;
     bool gathering = false;
