@@ -29,8 +29,8 @@ protected:
         return file;
     }
     /// Writes `file` to out.xml and returns the bytes.
-    std::string write(OxXmlFile& file, OxBool expected) {
-        std::string path = messages.dir.file("out.xml");
+    std::string write(OxXmlFile& file, OxBool expected, const char* name = "out.xml") {
+        std::string path = messages.dir.file(name);
         EXPECT_EQ(file.open(path.c_str(), OxFile::OxIOOutput), 0);
         EXPECT_EQ(file.writeFile(), expected);
         return oxtest::readText(path);
@@ -444,7 +444,8 @@ TEST_F(OxXmlFileTest, UnflushedWriteGivesTheSameBytes) {
     // same lines in both modes.
     auto empty = read("", OxTrue);
     empty->setFlushEveryLine(OxFalse);
-    EXPECT_EQ(write(*empty, OxTrue), "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n\n");
+    // (Another name: Windows removes no file that another document holds open.)
+    EXPECT_EQ(write(*empty, OxTrue, "empty.xml"), "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n\n");
     file->getRootForUpdate()->getChild(1)->addChild(new OxXmlElement(nullptr));
     std::string failedUnflushed = write(*file, OxFalse);
     OxXmlFile::setIndent(0);

@@ -300,7 +300,7 @@ TEST(OxToolCsvHexdumpPathsRanges, OutputAndStatus) {
 TEST(OxToolDemo, RunsEveryStepOverTheSampleData) {
     oxtest::TempDir dir;
     oxtest::CommandResult demo =
-        oxtool("demo \"" + std::string(OXBASE_DATA_DIR) + "\" out", dir.path());
+        oxtool("demo \"" + oxtest::native(OXBASE_DATA_DIR) + "\" out", dir.path());
     EXPECT_EQ(demo.status, 0) << demo.err;
     EXPECT_TRUE(contains(demo.out, "all succeeded"));
     EXPECT_TRUE(fs::exists(dir.file("out/assembly.xml")));
@@ -311,7 +311,7 @@ TEST(OxToolMessages, TableOfLibraryNumbersAndTheGuideCopy) {
     // docs/messages.md is this command's output over the bundled file.
     std::string data = OXBASE_DATA_DIR;
     oxtest::CommandResult table =
-        oxtool("messages --markdown --messages \"" + data + "/oxbase.msg\"");
+        oxtool("messages --markdown --messages \"" + oxtest::dataFile("oxbase.msg") + "\"");
     EXPECT_EQ(table.status, 0);
     EXPECT_EQ(table.out, oxtest::readFile(data + "/../docs/messages.md"))
         << "docs/messages.md is out of date: build the docs target";

@@ -240,8 +240,12 @@ std::vector<std::string> oxtoolMessageFileCandidates(const std::string& executab
                                  .lexically_normal()
                                  .string());
     }
-    candidates.push_back((fs::path(OXTOOL_DEFAULT_DATA_DIR) / OXBASE_MESSAGE_FILE).string());
-    candidates.push_back((fs::path(OXBASE_DATA_DIR) / OXBASE_MESSAGE_FILE).string());
+    // The build's directories are written with '/'; the library takes only
+    // the platform's separator (a backslash on Windows) as one.
+    candidates.push_back(
+        (fs::path(OXTOOL_DEFAULT_DATA_DIR) / OXBASE_MESSAGE_FILE).make_preferred().string());
+    candidates.push_back(
+        (fs::path(OXBASE_DATA_DIR) / OXBASE_MESSAGE_FILE).make_preferred().string());
     return candidates;
 }
 

@@ -234,7 +234,9 @@ std::string chooseMessageFile(const OxToolContext& context, const Parsed& parsed
 
 int runDemo(const OxToolContext& context) {
     OxToolDemoContext demo;
-    demo.dataDir = context.operands.size() > 0 ? context.operands[0] : OXTOOL_DEFAULT_DATA_DIR;
+    demo.dataDir = context.operands.size() > 0
+                       ? context.operands[0]
+                       : std::filesystem::path(OXTOOL_DEFAULT_DATA_DIR).make_preferred().string();
     demo.outDir = context.operands.size() > 1 ? context.operands[1] : "oxtool-demo-out";
     demo.messageFile = context.messageFile;
     std::string sample = oxtoolJoin(demo.dataDir, "oxbase.msg");
