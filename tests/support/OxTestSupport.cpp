@@ -217,6 +217,11 @@ CommandResult runCommand(const std::string& command, const std::string& input) {
     line += " < \"" + (input.empty() ? std::string("/dev/null") : input) + "\"";
 #endif
     line += " > \"" + outputs.file("out") + "\" 2> \"" + outputs.file("err") + "\"";
+#ifdef _WIN32
+    // cmd /c drops the first and the last quote of a line that starts with
+    // one; a pair around the whole line keeps those of the command.
+    line = "\"" + line + "\"";
+#endif
     std::cout.flush();
     int raw = std::system(line.c_str());
     CommandResult result;
@@ -227,6 +232,22 @@ CommandResult runCommand(const std::string& command, const std::string& input) {
 #endif
     result.out = readFile(outputs.file("out"));
     result.err = readFile(outputs.file("err"));
+#ifdef _WIN32
+    // Text written to a redirected standard stream ends its lines with CR LF
+    // (Wine's cmd adds one more CR); the tests compare lines.
+    for (std::string* text : {&result.out, &result.err}) {
+        std::string lines;
+        for (size_t i = 0; i < text->size(); i++) {
+            size_t end = text->find_first_not_of('\r', i);
+            if ((*text)[i] == '\r' && end != std::string::npos && (*text)[end] == '\n') {
+                i = end - 1;
+                continue;
+            }
+            lines += (*text)[i];
+        }
+        *text = lines;
+    }
+#endif
     return result;
 }
 

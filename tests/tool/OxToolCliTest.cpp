@@ -78,7 +78,7 @@ TEST(OxToolCommon, UsageErrorsEndWithStatusTwo) {
                                  "xml a.xml --verbose=yes"};
     for (const char* line : lines) {
         oxtest::CommandResult result = oxtool(line, dir.path());
-        EXPECT_EQ(result.status, 2) << line;
+        EXPECT_EQ(result.status, 2) << line << ": " << result.err;
         EXPECT_FALSE(result.err.empty()) << line;
         EXPECT_TRUE(result.out.empty()) << line << ": " << result.out;
     }
@@ -126,7 +126,7 @@ TEST(OxToolXml, StatusIsTheWorstMessageAndDashIsStandardInputOrOutput) {
     // IN "-": standard input.
     oxtest::CommandResult in = oxtool("xml - copy.xml", dir.path(), dir.file("m.xml"));
     EXPECT_EQ(in.status, 4);
-    EXPECT_EQ(oxtest::readFile(dir.file("copy.xml")),
+    EXPECT_EQ(oxtest::readText(dir.file("copy.xml")),
               "<?xml version=\"1.0\"?>\n<a>\n <b/>\n</a>\n");
     oxtest::CommandResult dump = oxtool("xml-dump -", dir.path(), dir.file("clean.xml"));
     EXPECT_EQ(dump.status, 0);
@@ -146,7 +146,7 @@ TEST(OxToolCheck, FilesDirectoriesListsAndSummary) {
     // A directory: its .xml and .csv files, whatever the case of the ending.
     oxtest::CommandResult folder = oxtool("check docs", dir.path());
     EXPECT_EQ(folder.status, 4);
-    EXPECT_TRUE(contains(folder.out, "docs/sub/m.xml:3: warning: "));
+    EXPECT_TRUE(contains(folder.out, oxtest::native("docs/sub/m.xml") + ":3: warning: "));
     EXPECT_TRUE(contains(folder.out, "[msg 567]"));
     EXPECT_TRUE(contains(folder.out, "checked 3 files"));
     EXPECT_TRUE(contains(folder.out, "1 warning, 0 errors"));
@@ -213,6 +213,10 @@ TEST(OxToolWalkAndList, MissingStartsAndWalksThatEndEarly) {
 }
 
 TEST(OxToolWalkAndList, DirectoryBeyondThePathLimitIsReported) {
+#ifdef _WIN32
+    GTEST_SKIP() << "a working directory on Windows is at most MAX_PATH long: the chain "
+                    "beyond the path limit cannot be made from inside";
+#endif
     oxtest::TempDir dir;
     // A chain of directories whose full path is longer than a path may be:
     // made one level at a time from inside.

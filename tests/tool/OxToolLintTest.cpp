@@ -256,7 +256,7 @@ std::map<std::string, std::set<std::string>> lintByDocument(const std::string& r
         size_t tag = line.rfind("[lint:");
         size_t name = line.find(".xml");
         if (tag != std::string::npos && name != std::string::npos) {
-            size_t begin = line.rfind('/', name);
+            size_t begin = line.find_last_of("/\\", name);
             begin = begin == std::string::npos ? 0 : begin + 1;
             found[line.substr(begin, name + 4 - begin)].insert(
                 line.substr(tag + 6, line.size() - tag - 7));

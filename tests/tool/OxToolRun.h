@@ -13,7 +13,12 @@ namespace oxtest {
 /// test's own) and standard input from the file `input`.
 inline CommandResult oxtool(const std::string& arguments, const std::string& dir = "",
                             const std::string& input = "") {
+#ifdef _WIN32
+    // cmd.exe changes the drive only when asked to (/d).
+    std::string command = dir.empty() ? "" : "cd /d \"" + dir + "\" && ";
+#else
     std::string command = dir.empty() ? "" : "cd \"" + dir + "\" && ";
+#endif
     return runCommand(command + "\"" + OXTOOL_PATH + "\" " + arguments, input);
 }
 
