@@ -8,12 +8,12 @@
 #include "oxbase/doc/OxXmlAttribute.h"
 #include "oxbase/doc/OxXmlElement.h"
 #include "oxbase/doc/detail/OxCsvRecords.h"
+#include "oxbase/doc/detail/OxLineSource.h"
 #include "oxbase/doc/detail/OxXmlNames.h"
 #include "oxbase/doc/detail/OxXmlStore.h"
 #include "oxbase/io/OxInput.h"
 #include "oxbase/io/OxOutput.h"
 
-#include <climits>
 #include <cstdio>
 #include <cstring>
 #include <iostream>
@@ -26,10 +26,6 @@ using namespace oxbase::detail;
 char const OxCsvFile::OX_CSV_COMMENT_START = '#';
 
 namespace {
-
-/// The smallest line buffer: a line of 1039 characters, its terminator and
-/// one byte of reserve.
-constexpr unsigned long long kMinLineBuffer = 1041;
 
 char const* nameOf(OxFile const* file) {
     char const* name = file != nullptr ? file->getFilename() : nullptr;
@@ -117,18 +113,6 @@ OxBool OxCsvFile::readFile() {
         OxMsg::Log(OxMsgFileShortRead, nameOf(input));
         return OxFalse;
     }
-    // The buffer holds the longest line the file can have, so that no line is
-    // cut: a line of the stream's getline that fills the buffer would leave
-    // the stream failed and the rest of the file unread. A file of unknown
-    // length falls back to the smallest buffer; a line that overflows it is
-    // then reported below.
-    unsigned long long size = static_cast<unsigned long long>(input->getFileLength()) + 2;
-    if (size < kMinLineBuffer) {
-        size = kMinLineBuffer;
-    }
-    if (size > UINT_MAX) {
-        size = UINT_MAX;
-    }
     unsigned int presetColumns = columnNames.getLength();
     bool read = withMemory([&] {
         if (store == nullptr) {
@@ -137,17 +121,26 @@ OxBool OxCsvFile::readFile() {
         bool headerDone = presetColumns > 0;
         setRoot(store->newElement("root", 4));
         OxCsvRecords records(*store, *root, columnNames, separator);
-        std::unique_ptr<char[]> line(new char[size]);
-        for (;;) {
-            line[0] = '\0';
-            OxBool more = input->getline(line.get(), static_cast<unsigned int>(size - 1), '\n');
-            // A last line without a line end (or the part of a line that did
-            // not fit) is still a line: take it before looking at why the
-            // read ended.
-            takeLine(line.get(), std::strlen(line.get()), headerDone, records);
-            if (more != OxTrue) {
-                break;
+        // Lines are taken out of large blocks, whole whatever their length;
+        // a last line without a line end is a line too.
+        OxLineSource source(*input);
+        source.start(input->getFileLength());
+        char* line = nullptr;
+        size_t length = 0;
+        OxLineSource::Result got;
+        while ((got = source.next(line, length)) == OxLineSource::Line) {
+            if (source.lineMayHoldNul()) {
+                // The line ends at its first NUL byte.
+                auto* nul = static_cast<char*>(std::memchr(line, '\0', length));
+                length = nul != nullptr ? static_cast<size_t>(nul - line) : length;
             }
+            takeLine(line, length, headerDone, records);
+        }
+        if (got == OxLineSource::End) {
+            // Leave the input at its end, as a line reader would: it is then
+            // no longer good, and a second read stops at once.
+            char probe[2];
+            input->getline(probe, sizeof probe, '\n');
         }
     });
     if (!read) {

@@ -156,7 +156,7 @@ TEST_F(CsvTest, HostileInputIsReadWithoutLoss) {
     EXPECT_EQ(read(csv, ""), OxTrue);
     EXPECT_EQ(csv->getRoot()->getNbChildElements(), 0u);
 
-    std::string longValue(5000, 'x');
+    std::string longValue(100000, 'x'); // beyond the first block of lines
     std::string seps(400, ',');
     std::string text = "a,b\n" + longValue + ",1\n" + std::string("p,q\0r,s\n", 8) + seps + "z\n" +
                        std::string(3, '\0') + "\nlast,1";

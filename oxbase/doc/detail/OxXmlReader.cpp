@@ -110,15 +110,15 @@ OxBool OxXmlReader::run() {
     for (;;) {
         char* line = nullptr;
         size_t length = 0;
-        OxXmlLineSource::Result got = source.next(line, length);
-        if (got == OxXmlLineSource::End) {
+        OxLineSource::Result got = source.next(line, length);
+        if (got == OxLineSource::End) {
             // Leave the input at its end, as a line reader would: it is then
             // no longer good, and a second read stops at once.
             char probe[2];
             file.input->getline(probe, sizeof probe, '\n');
             break;
         }
-        if (got == OxXmlLineSource::ReadFailure) {
+        if (got == OxLineSource::ReadFailure) {
             result = OxFalse;
             break;
         }

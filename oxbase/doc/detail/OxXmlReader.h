@@ -6,7 +6,7 @@
 #define OXBASE_DOC_DETAIL_OXXMLREADER_H
 
 #include "oxbase/doc/OxXmlFile.h"
-#include "oxbase/doc/detail/OxXmlLineSource.h"
+#include "oxbase/doc/detail/OxLineSource.h"
 #include "oxbase/doc/detail/OxXmlPendingAttributes.h"
 #include "oxbase/doc/detail/OxXmlStore.h"
 #include "oxbase/doc/detail/OxXmlTextBuffer.h"
@@ -162,7 +162,7 @@ private:
     OxXmlFile& file;
     OxXmlStore& store;
     NameCache names;
-    OxXmlLineSource source;
+    OxLineSource source;
     State state = START;
     unsigned int lineNumber = 0;
     char* lineText = nullptr;

@@ -1,15 +1,15 @@
-// OxXmlLineSource.h: the lines of a text-mode input, whole, for the XML reader.
+// OxLineSource.h: the lines of a text-mode input, whole, for the XML and CSV readers.
 //
 // The length measured at the open is the most that is read; the text may
 // end sooner (CR LF read as "\n" on Windows). A line end of CR LF is left to
 // the reader's trimming, so CR LF and LF files read the same everywhere.
 // Without memory std::bad_alloc reaches the reader's caller (readFile).
 //
-//   OxXmlLineSource source(input);
+//   OxLineSource source(input);
 //   source.start(input.getFileLength());
-//   while (source.next(line, length) == OxXmlLineSource::Line) use(line, length);
-#ifndef OXBASE_DOC_DETAIL_OXXMLLINESOURCE_H
-#define OXBASE_DOC_DETAIL_OXXMLLINESOURCE_H
+//   while (source.next(line, length) == OxLineSource::Line) use(line, length);
+#ifndef OXBASE_DOC_DETAIL_OXLINESOURCE_H
+#define OXBASE_DOC_DETAIL_OXLINESOURCE_H
 
 #include "oxbase/io/OxInput.h"
 
@@ -26,12 +26,12 @@ namespace detail {
 /// unfinished line, a finished line is handed out in place, and the buffer
 /// only grows when a single line does not fit. Every byte is read, scanned
 /// and moved at most once, so the work is linear in the file's size.
-class OxXmlLineSource {
+class OxLineSource {
 public:
-    explicit OxXmlLineSource(OxInput& in) : input(in) {}
-    OxXmlLineSource(const OxXmlLineSource&) = delete;
-    OxXmlLineSource& operator=(const OxXmlLineSource&) = delete;
-    ~OxXmlLineSource() { delete[] buffer; }
+    explicit OxLineSource(OxInput& in) : input(in) {}
+    OxLineSource(const OxLineSource&) = delete;
+    OxLineSource& operator=(const OxLineSource&) = delete;
+    ~OxLineSource() { delete[] buffer; }
 
     enum Result { Line, End, ReadFailure };
 
