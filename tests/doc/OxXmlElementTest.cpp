@@ -7,6 +7,7 @@
 
 #include <memory>
 #include <string>
+#include <vector>
 
 namespace {
 /// An element with one attribute `name`="value".
@@ -113,9 +114,7 @@ TEST(OxXmlElementTest, PointsAndColours) {
     EXPECT_EQ(p[0], 9.0);
     EXPECT_EQ(withAttribute("vec3d", "1,2,3")->getPoint(p), OxFalse);
     EXPECT_EQ(withAttribute("vec3d", "1 2 3 4")->getPoint(p), OxTrue);
-    EXPECT_EQ(p[0], 1.0);
-    EXPECT_EQ(p[1], 2.0);
-    EXPECT_EQ(p[2], 3.0);
+    EXPECT_EQ((std::vector<double>{p[0], p[1], p[2]}), (std::vector<double>{1, 2, 3}));
     EXPECT_EQ(withAttribute("vec3d", "1\t2  x3")->getPoint(p), OxTrue); // no number counts 0
     EXPECT_EQ(p[2], 0.0);
     EXPECT_EQ(withAttribute("vec3d", "   ")->getPoint(p), OxFalse); // empty value: no copy
@@ -123,8 +122,7 @@ TEST(OxXmlElementTest, PointsAndColours) {
 
     OxVec2d q;
     EXPECT_EQ(withAttribute("vec2d", "0.5 -1.5e1")->getPoint(q), OxTrue);
-    EXPECT_EQ(q[0], 0.5);
-    EXPECT_EQ(q[1], -15.0);
+    EXPECT_EQ((std::vector<double>{q[0], q[1]}), (std::vector<double>{0.5, -15.0}));
     OxVec4d r;
     EXPECT_EQ(withAttribute("vec4d", "1 2 3")->getPoint(r), OxFalse);
     EXPECT_EQ(withAttribute("w", "1 2 3 4")->getPoint("w", r), OxTrue);
@@ -134,9 +132,7 @@ TEST(OxXmlElementTest, PointsAndColours) {
     EXPECT_EQ(withAttribute("color", "0.5 0.25 1 7")->getColor(color), OxTrue);
     double red = 0, green = 0, blue = 0;
     color.getColor(red, green, blue);
-    EXPECT_EQ(red, 0.5);
-    EXPECT_EQ(green, 0.25);
-    EXPECT_EQ(blue, 1.0);
+    EXPECT_EQ((std::vector<double>{red, green, blue}), (std::vector<double>{0.5, 0.25, 1.0}));
 }
 TEST(OxXmlElementTest, IndexLists) {
     // The list form with its line end, and the int array form.

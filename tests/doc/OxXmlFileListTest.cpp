@@ -31,16 +31,15 @@ bool kept(const char* path) {
 } // namespace
 
 TEST(OxXmlFileListTest, FilterCases) {
-    EXPECT_TRUE(kept("dir/model.xml"));
-    EXPECT_FALSE(kept("dir/model.XML"));
-    EXPECT_FALSE(kept("dir/model.xml.bak"));
-    EXPECT_TRUE(kept("dir/model.xmlx")); // four characters compared
-    EXPECT_FALSE(kept("dir.d/model"));
-    EXPECT_TRUE(kept("a.xml/model")); // the last "." of the whole path
-    EXPECT_FALSE(kept(".xml"));       // the first character is not looked at
-    EXPECT_TRUE(kept("dir/.xml"));
-    EXPECT_FALSE(kept("model"));
-    EXPECT_FALSE(kept("model.xm"));
+    // Four characters behind the last "." of the whole path are compared,
+    // with case; the first character of the path is not looked at.
+    for (const char* yes : {"dir/model.xml", "dir/model.xmlx", "a.xml/model", "dir/.xml"}) {
+        EXPECT_TRUE(kept(yes)) << yes;
+    }
+    for (const char* no :
+         {"dir/model.XML", "dir/model.xml.bak", "dir.d/model", ".xml", "model", "model.xm"}) {
+        EXPECT_FALSE(kept(no)) << no;
+    }
 
     OxGList<char*> list;
     EXPECT_EQ(OxXmlFileListTestAccess::filter("x.xml", OxFTWDirectory, &list), 0);

@@ -268,17 +268,14 @@ TEST_F(FaultTest, NothingButRegularFilesIsRead) {
     ASSERT_EQ(mkfifo(work.file("pipe.msg").c_str(), 0600), 0);
 #endif
     oxtest::writeFile(app.file("pipe.msg"), "7,I,0past the pipe\n");
+    auto message7 = [&](const char* file) {
+        OxMsg msg(file, app.path().c_str(), nullptr, nullptr);
+        return std::string(OxMsg::LogToString(7) != nullptr ? OxMsg::LogToString(7) : "<none>");
+    };
     fs::path home = fs::current_path();
     fs::current_path(work.path());
-    std::string fromDirectory, pastThePipe;
-    {
-        OxMsg msg("app.msg", app.path().c_str(), nullptr, nullptr);
-        fromDirectory = OxMsg::LogToString(7) != nullptr ? OxMsg::LogToString(7) : "<none>";
-    }
-    {
-        OxMsg msg("pipe.msg", app.path().c_str(), nullptr, nullptr);
-        pastThePipe = OxMsg::LogToString(7) != nullptr ? OxMsg::LogToString(7) : "<none>";
-    }
+    std::string fromDirectory = message7("app.msg");
+    std::string pastThePipe = message7("pipe.msg");
     fs::current_path(home);
     EXPECT_EQ(fromDirectory, "from the application");
     EXPECT_EQ(pastThePipe, "past the pipe");
@@ -312,10 +309,13 @@ TEST_F(FaultTest, ReadOnlyOutputDirectory) {
 
 TEST(OxFaultWalk, DirectoryRemovedDuringAWalk) {
     oxtest::TempDir tmp;
-    for (const char* sub : {"a", "b", "c"}) {
-        fs::create_directories(tmp.file(std::string(sub) + "/deep/deeper"));
-        oxtest::writeFile(tmp.file(std::string(sub) + "/deep/deeper/f.txt"), "x");
-    }
+    auto plant = [&] { // a/, b/ and c/, each with deep/deeper/f.txt
+        for (const char* sub : {"a", "b", "c"}) {
+            fs::create_directories(tmp.file(std::string(sub) + "/deep/deeper"));
+            oxtest::writeFile(tmp.file(std::string(sub) + "/deep/deeper/f.txt"), "x");
+        }
+    };
+    plant();
     struct Seen {
         std::string root;
         std::vector<std::string> paths;
@@ -345,10 +345,7 @@ TEST(OxFaultWalk, DirectoryRemovedDuringAWalk) {
         testing::internal::GetCapturedStderr();
         // The root, the one subdirectory left and its three entries.
         EXPECT_EQ(seen.paths.size(), 5u) << slots;
-        for (const char* sub : {"a", "b", "c"}) {
-            fs::create_directories(tmp.file(std::string(sub) + "/deep/deeper"));
-            oxtest::writeFile(tmp.file(std::string(sub) + "/deep/deeper/f.txt"), "x");
-        }
+        plant();
     }
 }
 

@@ -8,7 +8,6 @@
 #include <filesystem>
 #include <gtest/gtest.h>
 #include <string>
-#include <unistd.h>
 #include <vector>
 
 namespace {
@@ -29,6 +28,13 @@ int keepFiles(const char* path, const OxStat*, OxFileTreeWalkType type, void* li
     return 0;
 }
 
+/// What readListFiles wrote to standard error; its answer must be `expected`.
+std::string readErrors(OxFileList& list, OxBool expected) {
+    testing::internal::CaptureStderr();
+    EXPECT_EQ(list.readListFiles(), expected);
+    return testing::internal::GetCapturedStderr();
+}
+
 using oxtest::dumpText;
 
 } // namespace
@@ -46,9 +52,7 @@ TEST(OxFileListTest, ListFileFormat) {
                              "name with blanks.txt\t\n"
                              "last-no-newline");
     OxFileList list(first.c_str());
-    testing::internal::CaptureStderr();
-    EXPECT_EQ(list.readListFiles(), OxTrue);
-    EXPECT_EQ(testing::internal::GetCapturedStderr(), "");
+    EXPECT_EQ(readErrors(list, OxTrue), "");
     EXPECT_EQ(names(list), (std::vector<std::string>{"a.txt", "\"b#c.txt\"", "x \"odd # kept",
                                                      "name with blanks.txt", "last-no-newline"}));
 
@@ -80,24 +84,18 @@ TEST(OxFileListTest, SecondChoicePathAndFailures) {
 
     OxFileList viaPath("found.lst"); // not in the working directory
     viaPath.setListFilePath(tmp.path().c_str());
-    testing::internal::CaptureStderr();
-    EXPECT_EQ(viaPath.readListFiles(), OxTrue);
-    EXPECT_EQ(testing::internal::GetCapturedStderr(), "");
+    EXPECT_EQ(readErrors(viaPath, OxTrue), "");
     EXPECT_EQ(names(viaPath), std::vector<std::string>{"one"});
 
     OxFileList noPath("missing-oxbase.lst");
-    testing::internal::CaptureStderr();
-    EXPECT_EQ(noPath.readListFiles(), OxFalse);
-    EXPECT_EQ(testing::internal::GetCapturedStderr(),
+    EXPECT_EQ(readErrors(noPath, OxFalse),
               "Unable to open list file.\n  Tried missing-oxbase.lst\n");
 
     // Names read before a failing list file stay.
     OxFileList withPath(tmp.file("found.lst").c_str());
     withPath.addListFile("missing-oxbase.lst");
     withPath.setListFilePath(tmp.path().c_str());
-    testing::internal::CaptureStderr();
-    EXPECT_EQ(withPath.readListFiles(), OxFalse);
-    EXPECT_EQ(testing::internal::GetCapturedStderr(),
+    EXPECT_EQ(readErrors(withPath, OxFalse),
               "Unable to open list file.\n  Tried missing-oxbase.lst and " +
                   tmp.file("missing-oxbase.lst") + "\n");
     EXPECT_EQ(names(withPath), std::vector<std::string>{"one"});
@@ -106,9 +104,7 @@ TEST(OxFileListTest, SecondChoicePathAndFailures) {
 
     // A list file that is a directory cannot be opened.
     OxFileList directory(tmp.path().c_str());
-    testing::internal::CaptureStderr();
-    EXPECT_EQ(directory.readListFiles(), OxFalse);
-    EXPECT_EQ(testing::internal::GetCapturedStderr(),
+    EXPECT_EQ(readErrors(directory, OxFalse),
               "Unable to open list file.\n  Tried " + tmp.path() + "\n");
 
     OxFileList empty;
@@ -153,15 +149,14 @@ TEST(OxFileListTest, AddFilesAndDirectories) {
                                        tmp.file("dir/sub/b.txt"), tmp.file("dir/sub/\xe9 c.txt")}));
 
     // A relative directory named in a list file.
-    char saved[4096];
-    ASSERT_NE(getcwd(saved, sizeof saved), nullptr);
-    ASSERT_EQ(chdir(tmp.path().c_str()), 0);
+    std::filesystem::path saved = std::filesystem::current_path();
+    std::filesystem::current_path(tmp.path());
     oxtest::writeFile("rel.lst", "dir/sub\n");
     OxFileList relative("rel.lst");
     relative.setFTWCallback(keepFiles);
     EXPECT_EQ(relative.readListFiles(), OxTrue);
     EXPECT_EQ(relative.getFileNameList().getLength(), 2u);
-    ASSERT_EQ(chdir(saved), 0);
+    std::filesystem::current_path(saved);
 }
 
 TEST(OxFileListTest, Dump) {

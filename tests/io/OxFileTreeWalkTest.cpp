@@ -17,6 +17,7 @@
 #include <functional>
 #include <gtest/gtest.h>
 #include <map>
+#include <memory>
 #include <string>
 #include <sys/stat.h>
 #include <vector>
@@ -76,8 +77,9 @@ void makeFile(const std::string& path) {
     oxtest::writeFile(path, "x");
 }
 
-/// root: a.txt .hidden b/ b/c.txt b/d/ b/d/e.txt f/
+/// root: a.txt .hidden b/ b/c.txt b/d/ b/d/e.txt f/ (root made if missing)
 void makeSmallTree(const std::string& root) {
+    fs::create_directories(root);
     makeFile(at(root, "a.txt"));
     makeFile(at(root, ".hidden"));
     fs::create_directories(at(root, "b/d"));
@@ -102,6 +104,20 @@ std::map<std::string, OxFileTreeWalkType> visitedOnce(const std::vector<Visit>& 
         EXPECT_TRUE(objects.emplace(visit.path, visit.type).second) << "twice: " << visit.path;
     }
     return objects;
+}
+
+/// The visits of a walk of `path` with `streams` slots (and the depth limit
+/// `depth` when not negative), whose run must answer `result`; the callback answers 7 at a path
+/// ending in `stopAt`.
+std::vector<Visit> walked(const std::string& path, int streams, int result = 0,
+                          const std::string& stopAt = "", int depth = -1) {
+    Recorder recorder;
+    recorder.stopAt = stopAt;
+    std::unique_ptr<OxFileTreeWalk> walk(
+        depth < 0 ? new OxFileTreeWalk(path.c_str(), record, streams, &recorder)
+                  : new OxFileTreeWalk(path.c_str(), record, streams, depth, &recorder));
+    EXPECT_EQ(walk->run(), result) << path;
+    return recorder.visits;
 }
 
 int indexOf(const std::vector<Visit>& visits, const std::string& path) {
@@ -214,31 +230,25 @@ std::string unreadableDirectoryFaults(const std::string& root, const std::string
 TEST(OxFileTreeWalkTest, VisitsEveryObjectOnceWithOneOrTenSlots) {
     oxtest::TempDir tmp;
     std::string root = tmp.file("tree");
-    fs::create_directory(root);
     makeSmallTree(root);
     fs::create_directories(at(root, "g/h/i/j"));
     makeFile(at(root, "g/h/i/j/k.txt"));
     std::string before = cwd();
 
-    Recorder one;
-    Recorder ten;
-    OxFileTreeWalk walkOne(root.c_str(), record, 1, &one);
-    OxFileTreeWalk walkTen(root.c_str(), record, 10, &ten);
     testing::internal::CaptureStderr();
-    EXPECT_EQ(walkOne.run(), 0);
-    EXPECT_EQ(walkTen.run(), 0);
+    std::vector<Visit> one = walked(root, 1);
+    std::vector<Visit> v = walked(root, 10);
     EXPECT_EQ(testing::internal::GetCapturedStderr(), "");
     EXPECT_EQ(cwd(), before);
 
-    EXPECT_EQ(visitedOnce(one.visits), expectedObjects(root));
-    EXPECT_EQ(visitedOnce(ten.visits), expectedObjects(root));
-    ASSERT_EQ(one.visits.size(), ten.visits.size());
-    for (size_t i = 0; i < one.visits.size(); i++) {
-        EXPECT_EQ(one.visits[i].path, ten.visits[i].path); // parking keeps the order
+    EXPECT_EQ(visitedOnce(one), expectedObjects(root));
+    EXPECT_EQ(visitedOnce(v), expectedObjects(root));
+    ASSERT_EQ(one.size(), v.size());
+    for (size_t i = 0; i < one.size(); i++) {
+        EXPECT_EQ(one[i].path, v[i].path); // parking keeps the order
     }
     // A directory comes before its contents, and a subdirectory's contents
     // before the next entry of its parent.
-    const std::vector<Visit>& v = ten.visits;
     EXPECT_EQ(indexOf(v, root), 0);
     EXPECT_LT(indexOf(v, at(root, "b")), indexOf(v, at(root, "b/c.txt")));
     EXPECT_LT(indexOf(v, at(root, "b/d")), indexOf(v, at(root, "b/d/e.txt")));
@@ -297,24 +307,17 @@ TEST(OxFileTreeWalkTest, DepthLimits) {
     makeSmallTree(tmp.path());
     const std::string& r = tmp.path();
 
-    Recorder zero;
-    OxFileTreeWalk walkZero(r.c_str(), record, 10, 0, &zero);
-    EXPECT_EQ(walkZero.getMaxDepth(), 0);
-    EXPECT_EQ(walkZero.run(), 0);
     std::map<std::string, OxFileTreeWalkType> expected = {{r, OxFTWDirectory},
                                                           {at(r, "a.txt"), OxFTWFile},
                                                           {at(r, ".hidden"), OxFTWFile},
                                                           {at(r, "b"), OxFTWDirectory},
                                                           {at(r, "f"), OxFTWDirectory}};
-    EXPECT_EQ(visitedOnce(zero.visits), expected);
-
-    Recorder oneLevel;
-    OxFileTreeWalk walkOne(r.c_str(), record, 10, 1, &oneLevel);
-    EXPECT_EQ(walkOne.run(), 0);
+    EXPECT_EQ(visitedOnce(walked(r, 10, 0, "", 0)), expected);
     expected[at(r, "b/c.txt")] = OxFTWFile;
     expected[at(r, "b/d")] = OxFTWDirectory;
-    EXPECT_EQ(visitedOnce(oneLevel.visits), expected);
+    EXPECT_EQ(visitedOnce(walked(r, 10, 0, "", 1)), expected);
 
+    EXPECT_EQ(OxFileTreeWalk(r.c_str(), record, 10, 0, nullptr).getMaxDepth(), 0);
     OxFileTreeWalk negative(r.c_str(), record, 0, -5, nullptr);
     EXPECT_EQ(negative.getMaxDepth(), -1);
     EXPECT_EQ(negative.getMaxStreams(), 1u);
@@ -325,11 +328,8 @@ TEST(OxFileTreeWalkTest, CallbackResultStopsTheWalk) {
     makeSmallTree(tmp.path());
     std::string before = cwd();
     for (int streams : {1, 10}) {
-        Recorder recorder;
-        recorder.stopAt = oxtest::native("/b/c.txt");
-        OxFileTreeWalk walk(tmp.path().c_str(), record, streams, &recorder);
-        EXPECT_EQ(walk.run(), 7);
-        EXPECT_EQ(recorder.visits.back().path, at(tmp.path(), "b/c.txt"));
+        std::vector<Visit> visits = walked(tmp.path(), streams, 7, oxtest::native("/b/c.txt"));
+        EXPECT_EQ(visits.back().path, at(tmp.path(), "b/c.txt"));
         EXPECT_EQ(cwd(), before);
     }
 }
@@ -341,35 +341,25 @@ TEST(OxFileTreeWalkTest, LinksToKnownDirectoriesAreNotWalkedTwice) {
 #else
     oxtest::TempDir tmp;
     std::string root = tmp.file("tree");
-    fs::create_directory(root);
     makeSmallTree(root);
     fs::create_directory_symlink("..", at(root, "b/up"));           // to an ancestor
     fs::create_directory_symlink(at(root, "b"), at(root, "alias")); // a second way in
-
-    Recorder linked;
-    OxFileTreeWalk walk(root.c_str(), record, 10, &linked);
-    EXPECT_EQ(walk.run(), 0);
-    std::map<std::string, OxFileTreeWalkType> seen = visitedOnce(linked.visits);
+    std::vector<Visit> linked = walked(root, 10);
+    std::map<std::string, OxFileTreeWalkType> seen = visitedOnce(linked);
     EXPECT_EQ(seen.count(at(root, "b/up")), 0u);
     // b is met twice (as b and as alias); whichever comes second is skipped.
     EXPECT_EQ(seen.count(at(root, "b")) + seen.count(at(root, "alias")), 1u);
-    for (const Visit& visit : linked.visits) {
+    for (const Visit& visit : linked) {
         EXPECT_EQ(visit.path.find("/up/"), std::string::npos) << visit.path;
     }
 
     // From a relative start the same: the links lead to known directories.
     std::string before = cwd();
     ASSERT_EQ(chdir(tmp.path().c_str()), 0);
-    Recorder relative;
-    OxFileTreeWalk walkRelative("tree/", record, 1, &relative);
-    EXPECT_EQ(walkRelative.run(), 0);
-    EXPECT_EQ(visitedOnce(relative.visits), seen);
-    Recorder dotted;
-    OxFileTreeWalk walkDotted("./tree/b", record, 1, &dotted);
-    EXPECT_EQ(walkDotted.run(), 0);
+    EXPECT_EQ(visitedOnce(walked("tree/", 1)), seen);
     // b, c.txt, d, d/e.txt, then up (the tree, new to this walk) with a.txt,
     // .hidden and f; alias and b below it lead to b, which is known.
-    EXPECT_EQ(dotted.visits.size(), 8u);
+    EXPECT_EQ(walked("./tree/b", 1).size(), 8u);
     ASSERT_EQ(chdir(before.c_str()), 0);
 #endif
 }
@@ -407,21 +397,12 @@ TEST(OxFileTreeWalkTest, VanishingEntriesAndRelativeStart) {
     // A relative start path walks like its absolute form, "." included.
     oxtest::TempDir tmp;
     std::string root = tmp.file("tree");
-    fs::create_directory(root);
     makeSmallTree(root);
     std::string before = cwd();
     fs::current_path(tmp.path());
-    Recorder relative;
-    std::string relativePath = oxtest::native("tree/"); // must outlive the walk's run
-    OxFileTreeWalk walkRelative(relativePath.c_str(), record, 1, &relative);
-    EXPECT_EQ(walkRelative.run(), 0);
+    EXPECT_EQ(visitedOnce(walked(oxtest::native("tree/"), 1)), expectedObjects(root));
     EXPECT_EQ(cwd(), tmp.path());
-    EXPECT_EQ(visitedOnce(relative.visits), expectedObjects(root));
-    Recorder dotted;
-    std::string dottedPath = oxtest::native("./tree/b");
-    OxFileTreeWalk walkDotted(dottedPath.c_str(), record, 1, &dotted);
-    EXPECT_EQ(walkDotted.run(), 0);
-    EXPECT_EQ(visitedOnce(dotted.visits), expectedObjects(at(root, "b")));
+    EXPECT_EQ(visitedOnce(walked(oxtest::native("./tree/b"), 1)), expectedObjects(at(root, "b")));
     fs::current_path(before);
 }
 
@@ -467,40 +448,24 @@ TEST(OxFileTreeWalkTest, StartPaths) {
               "OxFileTreeWalk::run: returning -1 at line 224\n"
               "OxFileTreeWalk::run: returning -1 at line 229\n");
 
-    Recorder file;
-    // The walk keeps the caller's pointer: the texts must outlive run.
-    std::string fileName = tmp.file("a.txt");
-    std::string missingName = tmp.file("nothing");
-    std::string orphanName = tmp.file("no/such");
-    OxFileTreeWalk walkFile(fileName.c_str(), record, 10, &file);
-    EXPECT_EQ(walkFile.run(), 0);
-    ASSERT_EQ(file.visits.size(), 1u);
-    EXPECT_EQ(file.visits[0].type, OxFTWFile);
-
-    Recorder missing;
-    missing.stopAt = "nothing";
-    OxFileTreeWalk walkMissing(missingName.c_str(), record, 10, &missing);
-    EXPECT_EQ(walkMissing.run(), 7);
-    ASSERT_EQ(missing.visits.size(), 1u);
-    EXPECT_EQ(missing.visits[0].type, OxFTWFile);
-
-    Recorder orphan;
-    OxFileTreeWalk walkOrphan(orphanName.c_str(), record, 10, &orphan);
-    EXPECT_EQ(walkOrphan.run(), -1);
-    EXPECT_TRUE(orphan.visits.empty());
+    // A file is visited alone; a missing start is reported once as a file
+    // (the callback's answer is run's); below a missing directory, nothing.
+    for (const char* name : {"a.txt", "nothing"}) {
+        std::vector<Visit> alone = walked(tmp.file(name), 10, name[0] == 'a' ? 0 : 7, "nothing");
+        ASSERT_EQ(alone.size(), 1u);
+        EXPECT_EQ(alone[0].type, OxFTWFile);
+    }
+    EXPECT_TRUE(walked(tmp.file("no/such"), 10, -1).empty());
 
     // Trailing separators are dropped (on POSIX of either kind); paths get
     // one separator.
-    Recorder trailing;
 #ifdef _WIN32
-    std::string withSeparators = tmp.path() + "\\b\\\\";
+    std::vector<Visit> trailing = walked(tmp.path() + "\\b\\\\", 10);
 #else
-    std::string withSeparators = tmp.path() + "/b//\\";
+    std::vector<Visit> trailing = walked(tmp.path() + "/b//\\", 10);
 #endif
-    OxFileTreeWalk walkTrailing(withSeparators.c_str(), record, 10, &trailing);
-    EXPECT_EQ(walkTrailing.run(), 0);
-    EXPECT_EQ(trailing.visits[0].path, at(tmp.path(), "b"));
-    EXPECT_GE(indexOf(trailing.visits, at(tmp.path(), "b/c.txt")), 0);
+    EXPECT_EQ(trailing[0].path, at(tmp.path(), "b"));
+    EXPECT_GE(indexOf(trailing, at(tmp.path(), "b/c.txt")), 0);
     EXPECT_EQ(cwd(), before);
 }
 
@@ -511,15 +476,12 @@ TEST(OxFileTreeWalkTest, BadInputNeverCrashes) {
     fs::create_directory(at(r, "dir with blank"));
     makeFile(at(r, "dir with blank/a b.txt"));
     makeFile(at(r, "\xe9t\xe9\xff.xml"));
-    Recorder all;
-    OxFileTreeWalk walk(r.c_str(), record, 2, &all);
-    EXPECT_EQ(walk.run(), 0);
     std::map<std::string, OxFileTreeWalkType> expected = {
         {r, OxFTWDirectory},
         {at(r, "dir with blank"), OxFTWDirectory},
         {at(r, "dir with blank/a b.txt"), OxFTWFile},
         {at(r, "\xe9t\xe9\xff.xml"), OxFTWFile}};
-    EXPECT_EQ(visitedOnce(all.visits), expected);
+    EXPECT_EQ(visitedOnce(walked(r, 2)), expected);
 }
 
 TEST(OxFileTreeWalkTest, PathsBeyond260Characters) {
@@ -536,17 +498,12 @@ TEST(OxFileTreeWalkTest, PathsBeyond260Characters) {
     makeFile(at(deep, "leaf.txt"));
     ASSERT_GT(deep.size(), 400u);
 
-    Recorder all;
-    OxFileTreeWalk walk(r.c_str(), record, 2, &all);
-    EXPECT_EQ(walk.run(), 0);
-    EXPECT_EQ(visitedOnce(all.visits), expectedObjects(r));
+    EXPECT_EQ(visitedOnce(walked(r, 2)), expectedObjects(r));
 
     // A start path longer than 260 characters is walked whole.
-    Recorder fromDeep;
-    OxFileTreeWalk walkDeep(deep.c_str(), record, 2, &fromDeep);
-    EXPECT_EQ(walkDeep.run(), 0);
-    ASSERT_EQ(fromDeep.visits.size(), 2u);
-    EXPECT_EQ(fromDeep.visits[1].path, at(deep, "leaf.txt"));
+    std::vector<Visit> fromDeep = walked(deep, 2);
+    ASSERT_EQ(fromDeep.size(), 2u);
+    EXPECT_EQ(fromDeep[1].path, at(deep, "leaf.txt"));
 #endif
 }
 

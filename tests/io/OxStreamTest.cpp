@@ -37,16 +37,13 @@ TEST_F(IoTest, EveryValueTypeHasItsByteLayout) {
     {
         OxOutput out(path.c_str(), kBinary);
         ASSERT_EQ(out.isGood(), OxTrue);
-        EXPECT_EQ(out.write('A'), OxTrue);
-        EXPECT_EQ(out.write(static_cast<unsigned char>(0xFE)), OxTrue);
-        EXPECT_EQ(out.write(static_cast<short>(-2)), OxTrue);
-        EXPECT_EQ(out.write(static_cast<unsigned short>(0x1234)), OxTrue);
-        EXPECT_EQ(out.write(-2), OxTrue);
-        EXPECT_EQ(out.write(16909060u), OxTrue);
-        EXPECT_EQ(out.write(1.0f), OxTrue);
-        EXPECT_EQ(out.write(-2.5), OxTrue);
-        EXPECT_EQ(out.write(block, 3), OxTrue);
-        EXPECT_EQ(out.write(reinterpret_cast<unsigned char*>(block), 0), OxTrue);
+        // Each write answers OxTrue (1): ten writes, ten.
+        EXPECT_EQ(out.write('A') + out.write(static_cast<unsigned char>(0xFE)) +
+                      out.write(static_cast<short>(-2)) +
+                      out.write(static_cast<unsigned short>(0x1234)) + out.write(-2) +
+                      out.write(16909060u) + out.write(1.0f) + out.write(-2.5) +
+                      out.write(block, 3) + out.write(reinterpret_cast<unsigned char*>(block), 0),
+                  10);
         EXPECT_EQ(static_cast<long long>(std::streamoff(out.getFilePosition())), 29);
     }
     // -2.5 is -1.25 * 2^1: sign 1, biased exponent 0x400, fraction 0x4000000000000.
@@ -289,34 +286,28 @@ TEST_F(IoTest, BadInputIsReportedNotFatal) {
 
 TEST_F(IoTest, OutputPreparesItsDirectory) {
     const std::string base = dir.path();
-    {
-        OxOutput out((base + R"(\made\f.bin)").c_str(), kBinary); // one missing level
-        EXPECT_EQ(out.isGood(), OxTrue);
-    }
+    // The messages of opening and closing an output that must be good or not.
+    auto opening = [&](const std::string& path, OxBool good) {
+        {
+            OxOutput out(path.c_str(), kBinary);
+            EXPECT_EQ(out.isGood(), good) << path;
+        }
+        return taken();
+    };
+    EXPECT_EQ(opening(base + R"(\made\f.bin)", OxTrue), Numbers{}); // one missing level
     EXPECT_TRUE(std::filesystem::is_regular_file(dir.file("made/f.bin")));
-    {
-        OxOutput out((base + R"(\a\b\f.bin)").c_str(), kBinary); // two missing levels
-        EXPECT_EQ(out.isGood(), OxFalse);
-        EXPECT_EQ(taken(), Numbers{"180"});
-        EXPECT_FALSE(std::filesystem::exists(dir.file("a")));
-    }
+    EXPECT_EQ(opening(base + R"(\a\b\f.bin)", OxFalse), Numbers{"180"}); // two missing levels
+    EXPECT_FALSE(std::filesystem::exists(dir.file("a")));
     oxtest::writeFile(dir.file("plain"), "x");
     {
         OxOutput out((base + R"(\plain\f.bin)").c_str(), kBinary);
         EXPECT_EQ(out.isGood(), OxFalse);
         EXPECT_EQ(log.take(), std::vector<std::string>{"m181 " + base + R"(\plain)"});
     }
-    {
-        OxOutput out(R"(\only-front.bin)", kBinary); // empty directory part
-        EXPECT_EQ(out.isGood(), OxFalse);
-        EXPECT_EQ(taken(), Numbers{"180"});
-    }
+    EXPECT_EQ(opening(R"(\only-front.bin)", OxFalse), Numbers{"180"}); // empty directory part
     std::filesystem::create_directory(dir.file("made/taken"));
-    {
-        OxOutput out((base + R"(\made\taken)").c_str(), kBinary); // a directory in the way
-        EXPECT_EQ(out.isGood(), OxFalse);
-        EXPECT_EQ(taken(), Numbers{"182"});
-    }
+    // a directory in the way
+    EXPECT_EQ(opening(base + R"(\made\taken)", OxFalse), Numbers{"182"});
     // An existing file is removed first: a second link keeps the old text.
     oxtest::writeFile(dir.file("made/old.txt"), "old");
     std::filesystem::create_hard_link(dir.file("made/old.txt"), dir.file("made/link.txt"));
@@ -332,10 +323,7 @@ TEST_F(IoTest, OutputPreparesItsDirectory) {
     // Without a separator nothing is removed: the truncation empties the file.
     std::filesystem::path home = std::filesystem::current_path();
     std::filesystem::current_path(dir.file("made"));
-    {
-        OxOutput out("link.txt", kBinary);
-        EXPECT_EQ(out.isGood(), OxTrue);
-    }
+    EXPECT_EQ(opening("link.txt", OxTrue), Numbers{});
     std::filesystem::current_path(home);
     EXPECT_EQ(oxtest::readFile(dir.file("made/old.txt")), oxtest::textBytes("new\n\n"));
     EXPECT_EQ(oxtest::readFile(dir.file("made/link.txt")), "");
