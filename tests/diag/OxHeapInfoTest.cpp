@@ -101,12 +101,8 @@ std::vector<FakeBlock> blocksAt(const std::vector<std::uintptr_t>& addresses) {
     return blocks;
 }
 
-struct Flushes {
-    std::vector<std::string> texts;
-};
-
 void collect(const char* text, void* userData) {
-    static_cast<Flushes*>(userData)->texts.push_back(text);
+    static_cast<std::vector<std::string>*>(userData)->push_back(text);
 }
 
 std::string pointerText(const void* address) {
@@ -296,7 +292,8 @@ TEST(OxHeapInfoTest, MemusageListsEveryEntryAndShowsUsedBlocks) {
     OxHeapInfo picture;
     snapOf(heap, picture);
 
-    Flushes flushes; // outlives the print object, whose destructor flushes once more
+    std::vector<std::string>
+        flushes; // outlives the print object, whose destructor flushes once more
     OxPrt prt;
     prt.setPrtCallback(collect);
     prt.setUserData(&flushes);
@@ -317,7 +314,7 @@ TEST(OxHeapInfoTest, MemusageListsEveryEntryAndShowsUsedBlocks) {
         "000000 61 62 63 64 65 " + std::string(33, ' ') + "| abcde" + std::string(11, ' ') + "\n\n";
 
     EXPECT_EQ(picture.memusage(prt, OxHeapInfo::MEMUSAGE_TOTAL), 25u);
-    EXPECT_TRUE(flushes.texts.empty());
+    EXPECT_TRUE(flushes.empty());
 
     struct Case {
         int type;
@@ -329,9 +326,9 @@ TEST(OxHeapInfoTest, MemusageListsEveryEntryAndShowsUsedBlocks) {
         {7, {usedLong, freeLine, usedShort, ""}},
     };
     for (const Case& c : cases) {
-        flushes.texts.clear();
+        flushes.clear();
         EXPECT_EQ(picture.memusage(prt, static_cast<OxHeapInfo::MEMUSAGE_TYPE>(c.type)), 25u);
-        EXPECT_EQ(flushes.texts, c.texts) << "type " << c.type;
+        EXPECT_EQ(flushes, c.texts) << "type " << c.type;
     }
 
     // A never filled entry (the heap shrank between the walks) lists as free.
@@ -339,18 +336,17 @@ TEST(OxHeapInfoTest, MemusageListsEveryEntryAndShowsUsedBlocks) {
         FakeHeap shrinking({{{0x10, 8, 1}, {0x20, 8, 1}}, {{0x10, 8, 0}}});
         picture.snap();
     }
-    flushes.texts.clear();
+    flushes.clear();
     picture.memusage(prt, OxHeapInfo::MEMUSAGE_FULL);
-    EXPECT_EQ(flushes.texts,
-              (std::vector<std::string>{line("FREE ", 0x10, 8), line("FREE ", 0, 0), ""}));
+    EXPECT_EQ(flushes, (std::vector<std::string>{line("FREE ", 0x10, 8), line("FREE ", 0, 0), ""}));
 
     // Without a picture: one flush, of nothing.
     picture.release();
-    flushes.texts.clear();
+    flushes.clear();
     EXPECT_EQ(picture.memusage(prt, OxHeapInfo::MEMUSAGE_HEADS), 0u);
-    EXPECT_EQ(flushes.texts, std::vector<std::string>{""});
+    EXPECT_EQ(flushes, std::vector<std::string>{""});
     EXPECT_EQ(picture.memusage(prt, OxHeapInfo::MEMUSAGE_TOTAL), 0u);
-    EXPECT_EQ(flushes.texts.size(), 1u);
+    EXPECT_EQ(flushes.size(), 1u);
     OxPrt::adjustIndent(-2);
 
     std::ostrstream stream;
