@@ -4,39 +4,42 @@
 
 #include <gtest/gtest.h>
 
-#include <string>
-
 #include <algorithm>
 #include <random>
 #include <sstream>
+#include <string>
 #include <vector>
+
+namespace {
+/// The elements of `list`, in order.
+template <class T> std::vector<T> contents(const OxGList<T>& list) {
+    return std::vector<T>(list.data, list.data + list.getLength());
+}
+
+/// Appends `count` values (10, 11, ...) to `list`, checking that each append
+/// returns the new element's index; gives the capacity after each append.
+std::vector<unsigned int> capacitiesWhileAppending(OxGList<unsigned int>& list,
+                                                   unsigned int count) {
+    std::vector<unsigned int> seen;
+    for (unsigned int i = 0; i < count; i++) {
+        unsigned int index = list.getLength();
+        EXPECT_EQ(list.append(10 + i), index);
+        seen.push_back(list.capacity);
+    }
+    return seen;
+}
+using Sizes = std::vector<unsigned int>;
+} // namespace
 
 TEST(OxGList, GrowthFollowsPowersOfTwo) {
     OxGList<unsigned int> list;
     EXPECT_EQ(list.capacity, 4u);
-    EXPECT_EQ(list.append(10), 0u);
-    for (unsigned int i = 1; i < 4; i++) {
-        list.append(i);
-    }
-    EXPECT_EQ(list.capacity, 4u);
-    list.append(5);
-    EXPECT_EQ(list.capacity, 8u);
-    for (unsigned int i = 0; i < 3; i++) {
-        list.append(i);
-    }
-    EXPECT_EQ(list.capacity, 8u);
-    EXPECT_EQ(list.append(9), 8u);
-    EXPECT_EQ(list.capacity, 16u);
+    EXPECT_EQ(capacitiesWhileAppending(list, 9), (Sizes{4, 4, 4, 4, 8, 8, 8, 8, 16}));
     EXPECT_EQ(list[0], 10u);
-
+    // An emptied list starts from one element.
     list.makeEmpty();
     EXPECT_EQ(list.data, nullptr);
-    list.append(1);
-    EXPECT_EQ(list.capacity, 1u);
-    list.append(2);
-    EXPECT_EQ(list.capacity, 2u);
-    list.append(3);
-    EXPECT_EQ(list.capacity, 4u);
+    EXPECT_EQ(capacitiesWhileAppending(list, 3), (Sizes{1, 2, 4}));
 
     OxGList<unsigned int> reserved;
     reserved.reserve(3);
@@ -51,9 +54,8 @@ TEST(OxGList, GrowthFollowsPowersOfTwo) {
     EXPECT_EQ(sized.capacity, 4u);
     OxGList<unsigned int> bare(0);
     EXPECT_EQ(bare.data, nullptr);
-    bare.append(5);
-    EXPECT_EQ(bare.capacity, 1u);
-    EXPECT_EQ(bare[0], 5u);
+    EXPECT_EQ(capacitiesWhileAppending(bare, 1), Sizes{1});
+    EXPECT_EQ(bare[0], 10u);
 }
 
 TEST(OxGList, RangeReportOnlyBeyondLength) {
@@ -109,11 +111,8 @@ TEST(OxGList, CopySharesPointeesAndRemoveNullsKeepsOrder) {
         EXPECT_EQ(copy[4], &c);
     }
     list->removeNulls();
-    ASSERT_EQ(list->length, 3u);
+    EXPECT_EQ(contents(*list), (std::vector<int*>{&a, &b, &c}));
     EXPECT_EQ(list->capacity, 8u);
-    EXPECT_EQ((*list)[0], &a);
-    EXPECT_EQ((*list)[1], &b);
-    EXPECT_EQ((*list)[2], &c);
     delete list; // through the base pointer: the pointees stay
     EXPECT_EQ(c, 3);
 }
@@ -131,26 +130,17 @@ TEST(OxGList, SortOnBothPathsAndRemoveDuplicates) {
         }
         list.sort();
         std::sort(values.begin(), values.end());
-        ASSERT_EQ(list.length, size);
-        for (unsigned int i = 0; i < size; i++) {
-            ASSERT_EQ(list[i], values[i]) << "size " << size << " index " << i;
-        }
+        ASSERT_EQ(contents(list), values) << "size " << size;
         list.removeDuplicates();
         values.erase(std::unique(values.begin(), values.end()), values.end());
-        ASSERT_EQ(list.length, values.size());
-        for (unsigned int i = 0; i < list.length; i++) {
-            ASSERT_EQ(list[i], values[i]);
-        }
+        ASSERT_EQ(contents(list), values) << "size " << size;
     }
     OxGList<unsigned int> runs;
     for (unsigned int v : {1u, 1u, 2u, 2u, 2u, 3u}) {
         runs.append(v);
     }
     runs.removeDuplicates();
-    ASSERT_EQ(runs.length, 3u);
-    EXPECT_EQ(runs[0], 1u);
-    EXPECT_EQ(runs[1], 2u);
-    EXPECT_EQ(runs[2], 3u);
+    EXPECT_EQ(contents(runs), (Sizes{1, 2, 3}));
 }
 
 TEST(OxGBinaryTree, AscendingInsertStaysBalanced) {

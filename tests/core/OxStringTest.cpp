@@ -138,20 +138,17 @@ TEST(OxString, InPlaceEdits) {
 }
 
 TEST(OxString, StripTrailingZeros) {
-    EXPECT_EQ(stripZeros("1.500"), "1.5");
-    EXPECT_EQ(stripZeros("1.000"), "1.0");
-    EXPECT_EQ(stripZeros("10.0"), "10.0");
-    EXPECT_EQ(stripZeros("100"), "100");
-    EXPECT_EQ(stripZeros(".500"), ".5");
-    EXPECT_EQ(stripZeros("-2.50"), "-2.5");
-    EXPECT_EQ(stripZeros("1.050"), "1.05");
-    EXPECT_EQ(stripZeros("1.5e10"), "1.5e10");
-    EXPECT_EQ(stripZeros("1.50e10"), "1.50e10");
-    EXPECT_EQ(stripZeros("abc"), "abc");
-    EXPECT_EQ(stripZeros("1.2.30"), "1.2.30");
-    EXPECT_EQ(stripZeros("  2.200  "), "2.2");
+    // clang-format off
+    const char* const cases[][2] = {
+        {"1.500", "1.5"}, {"1.000", "1.0"}, {"10.0", "10.0"}, {"100", "100"}, {".500", ".5"},
+        {"-2.50", "-2.5"}, {"1.050", "1.05"}, {"1.5e10", "1.5e10"}, {"1.50e10", "1.50e10"},
+        {"abc", "abc"}, {"1.2.30", "1.2.30"}, {"  2.200  ", "2.2"}, {"", ""},
+    };
+    // clang-format on
+    for (const auto& c : cases) {
+        EXPECT_EQ(stripZeros(c[0]), c[1]) << c[0];
+    }
     EXPECT_EQ(stripZeros("1.500", ' '), "1.5  ");
-    EXPECT_EQ(stripZeros(""), "");
     EXPECT_EQ(OxString::stripTrailingZeros(nullptr, '\0'), nullptr);
 }
 

@@ -12,10 +12,6 @@ TEST(OxTypeTest, StoresBothNumbersAndDumpsNothing) {
     std::unique_ptr<OxType> tag(new OxType(static_cast<OxType::OxCADID>(-5), -1));
     EXPECT_EQ(tag->getCADID(), -5);
     EXPECT_EQ(tag->getType(), 0xffffffffu);
-    tag->setCADID(static_cast<OxType::OxCADID>(12));
-    tag->setType(300);
-    EXPECT_EQ(tag->getCADID(), 12);
-    EXPECT_EQ(tag->getType(), 300u);
 
     std::ostrstream stream;
     stream << "kept";

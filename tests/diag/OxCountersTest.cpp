@@ -13,17 +13,14 @@ TEST(OxCountersTest, CountingDownFloorsButDecrementWraps) {
         int amount;
         unsigned int expected;
     };
+    // clang-format off
     const Case cases[] = {
-        {3, -2, 1},
-        {2, -2, 0},
-        {1, -2, 0},
-        {0, -1, 0},
-        {5, 0, 5},
-        {5, 7, 12},
+        {3, -2, 1}, {2, -2, 0}, {1, -2, 0}, {0, -1, 0}, {5, 0, 5}, {5, 7, 12},
         {4294967295u, 1, 0},                 // adding wraps
         {4294967295u, INT_MIN, 2147483647u}, // the magnitude of INT_MIN is 2^31
         {2147483648u, INT_MIN, 0},
     };
+    // clang-format on
     for (const Case& c : cases) {
         OxCounter counter("n");
         for (unsigned int left = c.start; left > 0;) {

@@ -34,36 +34,21 @@ TEST(OxDefaultMessages, EveryLoggedNumberHasAMatchingText) {
     const struct {
         unsigned int number;
         const char* arguments;
-    } logged[] = {{OxMsgFileOpen, "s"},
-                  {OxMsgFileRead, "s"},
-                  {OxMsgFileShortRead, "s"},
-                  {OxMsgStreamEnd, ""},
-                  {OxMsgStreamFailed, ""},
-                  {OxMsgStreamBad, ""},
-                  {OxMsgMemoryPastEnd, ""},
-                  {OxMsgMemoryBeforeStart, ""},
-                  {OxMsgMemoryBeyondEnd, ""},
-                  {OxMsgMatrixSingular, ""},
-                  {OxMsgFileWrite, "s"},
-                  {OxMsgDirectoryCreate, "s"},
-                  {OxMsgNotADirectory, "s"},
-                  {OxMsgFileRemoveExisting, "s"},
-                  {OxMsgFileClose, "s"},
-                  {OxMsgNoMemory, "s"},
-                  {OxMsgRangeSyntax, "sus"},
-                  {OxMsgRangeBackwards, "suu"},
-                  {OxMsgFileRemove, "ss"},
-                  {OxMsgCwdUnreadable, "s"},
-                  {OxMsgXmlNoQuote, ""},
-                  {OxMsgXmlNoDeclaration, ""},
-                  {OxMsgXmlInnerDeclaration, ""},
-                  {OxMsgXmlBadTagEnd, ""},
-                  {OxMsgXmlErrorPlace, "suus"},
-                  {OxMsgXmlEndTagMismatch, "suuss"},
-                  {OxMsgXmlSecondTopLevel, "suus"},
-                  {OxMsgXmlNulBytes, "suu"},
-                  {OxMsgCsvWritten, "s"},
-                  {OxMsgXmlWritten, "s"}};
+    } logged[] = {
+        // clang-format off
+        {OxMsgFileOpen, "s"}, {OxMsgFileRead, "s"}, {OxMsgFileShortRead, "s"},
+        {OxMsgStreamEnd, ""}, {OxMsgStreamFailed, ""}, {OxMsgStreamBad, ""},
+        {OxMsgMemoryPastEnd, ""}, {OxMsgMemoryBeforeStart, ""}, {OxMsgMemoryBeyondEnd, ""},
+        {OxMsgMatrixSingular, ""}, {OxMsgFileWrite, "s"}, {OxMsgDirectoryCreate, "s"},
+        {OxMsgNotADirectory, "s"}, {OxMsgFileRemoveExisting, "s"}, {OxMsgFileClose, "s"},
+        {OxMsgNoMemory, "s"}, {OxMsgRangeSyntax, "sus"}, {OxMsgRangeBackwards, "suu"},
+        {OxMsgFileRemove, "ss"}, {OxMsgCwdUnreadable, "s"}, {OxMsgXmlNoQuote, ""},
+        {OxMsgXmlNoDeclaration, ""}, {OxMsgXmlInnerDeclaration, ""}, {OxMsgXmlBadTagEnd, ""},
+        {OxMsgXmlErrorPlace, "suus"}, {OxMsgXmlEndTagMismatch, "suuss"},
+        {OxMsgXmlSecondTopLevel, "suus"}, {OxMsgXmlNulBytes, "suu"}, {OxMsgCsvWritten, "s"},
+        {OxMsgXmlWritten, "s"},
+        // clang-format on
+    };
     // The library checks loaded texts against its own list: it must agree.
     for (const auto& entry : logged) {
         ASSERT_NE(OxMsgLibraryArguments(entry.number), nullptr) << entry.number;

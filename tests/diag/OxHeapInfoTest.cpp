@@ -8,6 +8,7 @@
 #include <algorithm>
 #include <cstdint>
 #include <cstdio>
+#include <memory>
 #include <random>
 #include <set>
 #include <sstream>
@@ -100,12 +101,8 @@ std::vector<FakeBlock> blocksAt(const std::vector<std::uintptr_t>& addresses) {
     return blocks;
 }
 
-struct Flushes {
-    std::vector<std::string> texts;
-};
-
 void collect(const char* text, void* userData) {
-    static_cast<Flushes*>(userData)->texts.push_back(text);
+    static_cast<std::vector<std::string>*>(userData)->push_back(text);
 }
 
 std::string pointerText(const void* address) {
@@ -185,28 +182,25 @@ TEST(OxHeapInfoTest, SortOrdersByAddressLikeStdSort) {
     std::mt19937_64 random(1234);
     std::vector<std::vector<std::uintptr_t>> inputs = {
         {}, {0x40}, {0x20, 0x10}, {0x10, 0x20}, {0x30, 0x10, 0x20}};
-    std::vector<std::uintptr_t> many;
-    many.reserve(2000);
-    for (int i = 0; i < 2000; i++) {
-        many.push_back(random() & ~std::uintptr_t(0xF));
+    std::vector<std::uintptr_t> many(2000);
+    for (std::uintptr_t& a : many) {
+        a = random() & ~std::uintptr_t(0xF);
     }
     inputs.push_back(many);
     std::vector<std::uintptr_t> sorted = many;
     std::sort(sorted.begin(), sorted.end());
     inputs.push_back(sorted);
     inputs.emplace_back(sorted.rbegin(), sorted.rend());
-    std::vector<std::uintptr_t> repeats;
-    repeats.reserve(500);
-    for (int i = 0; i < 500; i++) {
-        repeats.push_back(0x1000 + 0x10 * (random() % 7));
+    std::vector<std::uintptr_t> repeats(500);
+    for (std::uintptr_t& a : repeats) {
+        a = 0x1000 + 0x10 * (random() % 7);
     }
     inputs.push_back(repeats);
     inputs.emplace_back(37, 0x5550);
     for (int length = 3; length <= 12; length++) {
-        std::vector<std::uintptr_t> small;
-        small.reserve(length);
-        for (int i = 0; i < length; i++) {
-            small.push_back(0x100 * (random() % 9 + 1));
+        std::vector<std::uintptr_t> small(length);
+        for (std::uintptr_t& a : small) {
+            a = 0x100 * (random() % 9 + 1);
         }
         inputs.push_back(small);
     }
@@ -226,11 +220,10 @@ TEST(OxHeapInfoTest, SortOrdersByAddressLikeStdSort) {
 
 TEST(OxHeapInfoTest, DiffListsBlocksBetweenTheOthersAndNotAboveThem) {
     // Delivered out of order: diff sorts both pictures itself.
-    OxHeapInfo newer;
-    OxHeapInfo older;
+    OxHeapInfo newer, older;
     snapOf(blocksAt({0x60, 0x10, 0x25, 0x40, 0x20, 0x55, 0x30, 0x5}), newer);
     snapOf(blocksAt({0x50, 0x20, 0x30}), older);
-    OxHeapInfo* result = newer.diff(older);
+    std::unique_ptr<OxHeapInfo> result(newer.diff(older));
     ASSERT_NE(result, nullptr);
     // 0x5 and 0x10 lie below older's blocks, 0x25 and 0x40 between them;
     // 0x55 and 0x60 lie above 0x50 and are not reached.
@@ -241,32 +234,26 @@ TEST(OxHeapInfoTest, DiffListsBlocksBetweenTheOthersAndNotAboveThem) {
     }
     EXPECT_EQ(result->getUsedCount(), 0u);
     EXPECT_EQ(result->getUsedBytes(), 0u);
-    delete result;
     EXPECT_EQ(addressesOf(newer),
               (std::vector<std::uintptr_t>{0x5, 0x10, 0x20, 0x25, 0x30, 0x40, 0x55, 0x60}));
     EXPECT_EQ(addressesOf(older), (std::vector<std::uintptr_t>{0x20, 0x30, 0x50}));
 
     // With itself, and against or from a picture without entries: nothing.
     OxHeapInfo empty;
-    for (OxHeapInfo* other : {&newer, &empty}) {
-        result = newer.diff(*other);
+    for (auto pair : {std::make_pair(&newer, &newer), std::make_pair(&newer, &empty),
+                      std::make_pair(&empty, &newer)}) {
+        result.reset(pair.first->diff(*pair.second));
         ASSERT_NE(result, nullptr);
         EXPECT_EQ(result->getCount(), 0u);
         EXPECT_EQ(result->getEntry(0), nullptr);
-        delete result;
     }
-    result = empty.diff(newer);
-    ASSERT_NE(result, nullptr);
-    EXPECT_EQ(result->getCount(), 0u);
-    delete result;
 
     // Random pictures against a set computation: a block is listed when the
     // other picture lacks its address and has some address above it.
     std::mt19937 random(99);
     for (int round = 0; round < 20; round++) {
         // Distinct addresses, as a heap has them, each in one picture, both or neither.
-        std::vector<std::uintptr_t> mine;
-        std::vector<std::uintptr_t> theirs;
+        std::vector<std::uintptr_t> mine, theirs;
         for (std::uintptr_t a = 0x10; a <= 0x10 * 400; a += 0x10) {
             unsigned int where = random() % 4;
             if (where == 0 || where == 2) {
@@ -286,14 +273,12 @@ TEST(OxHeapInfoTest, DiffListsBlocksBetweenTheOthersAndNotAboveThem) {
             }
         }
         std::sort(expected.begin(), expected.end());
-        OxHeapInfo a;
-        OxHeapInfo b;
+        OxHeapInfo a, b;
         snapOf(blocksAt(mine), a);
         snapOf(blocksAt(theirs), b);
-        result = a.diff(b);
+        result.reset(a.diff(b));
         ASSERT_NE(result, nullptr);
         EXPECT_EQ(addressesOf(*result), expected) << "round " << round;
-        delete result;
     }
 }
 
@@ -307,7 +292,8 @@ TEST(OxHeapInfoTest, MemusageListsEveryEntryAndShowsUsedBlocks) {
     OxHeapInfo picture;
     snapOf(heap, picture);
 
-    Flushes flushes; // outlives the print object, whose destructor flushes once more
+    std::vector<std::string>
+        flushes; // outlives the print object, whose destructor flushes once more
     OxPrt prt;
     prt.setPrtCallback(collect);
     prt.setUserData(&flushes);
@@ -328,7 +314,7 @@ TEST(OxHeapInfoTest, MemusageListsEveryEntryAndShowsUsedBlocks) {
         "000000 61 62 63 64 65 " + std::string(33, ' ') + "| abcde" + std::string(11, ' ') + "\n\n";
 
     EXPECT_EQ(picture.memusage(prt, OxHeapInfo::MEMUSAGE_TOTAL), 25u);
-    EXPECT_TRUE(flushes.texts.empty());
+    EXPECT_TRUE(flushes.empty());
 
     struct Case {
         int type;
@@ -340,9 +326,9 @@ TEST(OxHeapInfoTest, MemusageListsEveryEntryAndShowsUsedBlocks) {
         {7, {usedLong, freeLine, usedShort, ""}},
     };
     for (const Case& c : cases) {
-        flushes.texts.clear();
+        flushes.clear();
         EXPECT_EQ(picture.memusage(prt, static_cast<OxHeapInfo::MEMUSAGE_TYPE>(c.type)), 25u);
-        EXPECT_EQ(flushes.texts, c.texts) << "type " << c.type;
+        EXPECT_EQ(flushes, c.texts) << "type " << c.type;
     }
 
     // A never filled entry (the heap shrank between the walks) lists as free.
@@ -350,18 +336,17 @@ TEST(OxHeapInfoTest, MemusageListsEveryEntryAndShowsUsedBlocks) {
         FakeHeap shrinking({{{0x10, 8, 1}, {0x20, 8, 1}}, {{0x10, 8, 0}}});
         picture.snap();
     }
-    flushes.texts.clear();
+    flushes.clear();
     picture.memusage(prt, OxHeapInfo::MEMUSAGE_FULL);
-    EXPECT_EQ(flushes.texts,
-              (std::vector<std::string>{line("FREE ", 0x10, 8), line("FREE ", 0, 0), ""}));
+    EXPECT_EQ(flushes, (std::vector<std::string>{line("FREE ", 0x10, 8), line("FREE ", 0, 0), ""}));
 
     // Without a picture: one flush, of nothing.
     picture.release();
-    flushes.texts.clear();
+    flushes.clear();
     EXPECT_EQ(picture.memusage(prt, OxHeapInfo::MEMUSAGE_HEADS), 0u);
-    EXPECT_EQ(flushes.texts, std::vector<std::string>{""});
+    EXPECT_EQ(flushes, std::vector<std::string>{""});
     EXPECT_EQ(picture.memusage(prt, OxHeapInfo::MEMUSAGE_TOTAL), 0u);
-    EXPECT_EQ(flushes.texts.size(), 1u);
+    EXPECT_EQ(flushes.size(), 1u);
     OxPrt::adjustIndent(-2);
 
     std::ostrstream stream;

@@ -1,8 +1,7 @@
-// OxHeapInfo on the platform's own heap walk: glibc's main arena, which the
-// Linux walker reads, and the runtime's _heapwalk on Windows. One test
-// follows glibc's layout exactly; the others hold for any heap whose walk
-// delivers blocks. Where the walker is off (sanitizer builds, valgrind) the
-// tests skip or check that the walk ends at once.
+// OxHeapInfo on the platform's own heap walk (glibc's main arena on Linux,
+// _heapwalk on Windows). One test follows glibc's layout exactly; the others
+// hold for any heap whose walk delivers blocks. Where the walker is off
+// (sanitizer builds, valgrind) the tests skip or check that the walk ends.
 #include "oxbase/core/OxSystem.h"
 #include "oxbase/diag/OxHeapInfo.h"
 #include "oxbase/platform/detail/OxPlatformHeap.h"
@@ -19,8 +18,7 @@ using namespace oxbase::detail;
 
 namespace {
 
-/// The blocks of the diff tests: 1,000 of 3,000 bytes each, cut from a run
-/// of freed 16,000-byte blocks.
+/// The diff tests' 1,000 blocks of 3,000 bytes, cut from freed 16,000-byte blocks.
 constexpr size_t kSize = 3000;
 constexpr unsigned int kBlocks = 1000;
 constexpr size_t kRunSize = 16000;
@@ -36,14 +34,11 @@ bool glibcWalker() {
     return OxSystem::getOS() == OxSystem::OxOSLinux && sizeof(void*) == 8;
 }
 
-/// Freed memory below a fence, from which blocks of one size are then cut:
-/// a run of `runSize` blocks is allocated until the latest ones climb in
-/// equal steps over `needed` bytes (the first ones may fill older free
-/// memory, the later ones come from the top of the heap), all but the
-/// highest (the fence) are freed, and blocks of `blockSize` are drained until
-/// one comes from the freed run: by then no other free memory serves that
-/// size. Every vector is reserved before the first allocation, so that the
-/// test allocates nothing else between its pictures.
+/// Freed memory below a fence: `runSize` blocks are allocated until the latest
+/// climb in equal steps over `needed` bytes, all but the highest (the fence)
+/// are freed, and `blockSize` blocks are drained until one comes from the
+/// freed run, when no other free memory serves that size. The vectors are
+/// reserved first, so nothing else is allocated between the pictures.
 struct FreedRun {
     std::uintptr_t low = 0;
     std::uintptr_t fence = 0;
@@ -87,9 +82,8 @@ struct FreedRun {
     FreedRun& operator=(const FreedRun&) = delete;
 };
 
-/// Takes `before`, makes `count` blocks of `size` into `blocks` (reserved by
-/// the caller, so that nothing else is allocated), takes `after` and returns
-/// after.diff(before), owned by the caller.
+/// Snaps `before`, makes `count` blocks of `size` into `blocks` (reserved by
+/// the caller), snaps `after`; returns after.diff(before), caller-owned.
 OxHeapInfo* blocksBetweenPictures(OxHeapInfo& before, OxHeapInfo& after, std::vector<void*>& blocks,
                                   unsigned int count, size_t size) {
     before.snap();
@@ -100,9 +94,8 @@ OxHeapInfo* blocksBetweenPictures(OxHeapInfo& before, OxHeapInfo& after, std::ve
     return after.diff(before);
 }
 
-/// Independent reckoning of what a diff against `older` must list of
-/// `blocks`: each block whose address the older picture lacks and that lies
-/// below the highest address it has.
+/// Independent reckoning of what a diff against `older` lists of `blocks`:
+/// those whose address `older` lacks and that lie below its highest address.
 std::set<std::uintptr_t> newBelowTheOlderTop(const OxHeapInfo& older,
                                              const std::vector<void*>& blocks) {
     std::set<std::uintptr_t> known;
@@ -170,11 +163,9 @@ TEST(OxHeapWalk, PictureOfTheRealHeap) {
     }
     EXPECT_TRUE(found);
     if (glibcWalker()) {
-        // glibc's chunks tile the arena: each block begins one size field
-        // (8 bytes) behind the end of the block before it. The second walk
-        // may meet fewer blocks than the first counted (allocating the entry
-        // array can merge freed small chunks): the entries it did not fill
-        // stay cleared, at the end.
+        // glibc's chunks tile the arena: each begins 8 bytes (a size field)
+        // behind the end of the one before. The second walk may meet fewer
+        // blocks than the first counted: unfilled entries stay cleared.
         unsigned int filled = 1;
         while (filled < picture.getCount() && picture.getEntry(filled)->state != 0) {
             ASSERT_EQ(addressOf(picture, filled - 1) + picture.getEntry(filled - 1)->size + 8,
@@ -185,45 +176,28 @@ TEST(OxHeapWalk, PictureOfTheRealHeap) {
         for (unsigned int i = filled; i < picture.getCount(); i++) {
             EXPECT_EQ(picture.getEntry(i)->address, nullptr);
         }
-        // Or it met more (the entry array carved off a free chunk): then the
-        // block not stored is the last one, the top chunk, which is free, and
-        // the used bytes are those of the stored blocks either way.
+        // Or more (the array carved a free chunk): the one not stored is the
+        // free top chunk, so the used bytes are the stored blocks' either way.
         EXPECT_EQ(picture.getUsedBytes(), usedSum);
     }
 }
 
 // Pictures before and after making 1,000 blocks of one size, then after
-// freeing them again.
-//
-// A diff lists only blocks below the highest address of the older picture,
-// and fresh blocks usually come from the top of the heap, above everything
-// the older picture holds. So the blocks are made inside the older
-// picture's range: a run of large blocks, lying one behind the other, is
-// allocated and freed again except its highest block, which stays as a
-// fence; the freed run coalesces into one free chunk below the fence, and
-// the 1,000 blocks are carved from it one behind the other.
-//
-// What makes the outcome exact:
-// - All sizes are "large" for glibc (1,008 bytes and more): such blocks
-//   never sit in the per-thread cache or a fastbin, they coalesce as soon
-//   as they are freed, and each request is served by the smallest free
-//   chunk that fits (small requests may instead split whatever chunk was
-//   split last).
-// - Before the first picture, blocks of the test's size are drained until
-//   one comes from the run's chunk. By then no smaller chunk that could
-//   serve this size is left, and the test frees nothing that could make
-//   one, so every later block comes from the run's chunk.
-// - snap allocates its entry array between its two walks, from the start
-//   of that chunk (or elsewhere, if it is small enough). The second walk
-//   records the rest of the chunk as a free block. The first of the 1,000
-//   blocks lands exactly at that recorded address, so the diff (which
-//   compares addresses) cannot list it; the other 999 lie behind it, below
-//   the fence.
-// - 3,000 bytes plus glibc's 8-byte size field is a multiple of 16, so each
-//   block's usable size is exactly 3,000.
-// - Between the first allocation and the last picture, the test makes no
-//   other allocation (its vectors are reserved beforehand) and no
-//   assertion.
+// freeing them. A diff lists only blocks below the older picture's highest
+// address, and fresh blocks usually come from the top of the heap; so the
+// blocks are carved from a freed run of large blocks below a kept fence.
+// What makes the outcome exact on glibc:
+// - All sizes are "large" (1,008 bytes and more): never cached or in a
+//   fastbin, coalesced when freed, served by the smallest chunk that fits.
+// - Draining until a block comes from the run leaves no smaller chunk for
+//   this size, and the test frees nothing that could make one.
+// - snap allocates its entry array between its walks, from the start of the
+//   run's chunk; the second walk records the rest as a free block, where the
+//   first of the 1,000 blocks lands, so the diff cannot list it; the other
+//   999 lie behind it, below the fence.
+// - 3,000 + glibc's 8-byte size field is a multiple of 16: usable size 3,000.
+// - No other allocation and no assertion between the first allocation and
+//   the last picture.
 TEST(OxHeapWalk, NewBlocksOfOneSizeAreFoundByDiff) {
     ASSERT_EQ(OxHeapInfo::setWalkFunction(nullptr), nullptr);
     if (OxHeapInfo::isPlatformWalkAvailable() == OxFalse) {
@@ -273,10 +247,8 @@ TEST(OxHeapWalk, NewBlocksOfOneSizeAreFoundByDiff) {
     EXPECT_EQ(listedOf(*made, expected, kSize, true), expected);
     delete made;
 
-    // After freeing, no block of the 1,000 is a used block of the third
-    // picture. Its own entry array, allocated between its walks, may well
-    // take the memory they left (and start at the first one's address):
-    // each of their addresses lies inside a free block or inside that array.
+    // After freeing, none of the 1,000 is a used block of the third picture:
+    // each lies in a free block or in that picture's own entry array.
     auto array = reinterpret_cast<std::uintptr_t>(freed.getEntry(0));
     for (void* block : blocks) {
         auto address = reinterpret_cast<std::uintptr_t>(block);
@@ -294,27 +266,17 @@ TEST(OxHeapWalk, NewBlocksOfOneSizeAreFoundByDiff) {
     }
 }
 
-// The same question on any heap whose walk delivers blocks, the Windows heap
-// of _heapwalk in particular, without knowing the allocator's layout: 1,000
-// blocks made between two pictures inside the first picture's address range
-// are what diff lists.
-//
-// The range is prepared as above, with what any allocator that reuses freed
-// memory does: a run of large blocks is allocated until the latest ones lie
-// one behind the other in equal steps, all but the highest (the fence) are
-// freed, and blocks of the test's size are drained until one comes from the
-// freed run. The later blocks then come from there too, below the fence.
-// What diff must list is reckoned independently from the first picture's
-// addresses: every new block that the first picture lacks and that lies
-// below its highest address. The first new block may start where the first
-// picture saw the free memory it was cut from; all the others must count.
+// The same on any heap whose walk delivers blocks (Windows' _heapwalk among
+// them), without knowing the layout: the range is prepared as above, which
+// any allocator that reuses freed memory honours, and what diff must list is
+// reckoned from the first picture. Only the first new block may be missed
+// (it may start where the first picture saw free memory).
 TEST(OxHeapWalk, NewBlocksInsideTheOlderRangeAreFoundByDiff) {
     ASSERT_EQ(OxHeapInfo::setWalkFunction(nullptr), nullptr);
     if (OxHeapInfo::isPlatformWalkAvailable() == OxFalse) {
         GTEST_SKIP() << kUnavailable;
     }
-    // Room for the blocks with any allocator's headers, and for the entry
-    // array of the first picture.
+    // Room for the blocks with any allocator's headers and the first entry array.
     constexpr std::uintptr_t kRoom = kBlocks * (kSize + 64) + 1024 * 1024;
     std::vector<void*> blocks;
     blocks.reserve(kBlocks);

@@ -27,18 +27,34 @@ void collect(const char* text, void* userData) {
     static_cast<std::vector<std::string>*>(userData)->push_back(text);
 }
 
+/// What `run` writes to standard error.
+template <class Run> std::string stderrOf(Run run) {
+    testing::internal::CaptureStderr();
+    run();
+    return testing::internal::GetCapturedStderr();
+}
+
 class OxMsgTest : public testing::Test {
 protected:
     oxtest::TempDir dir;
     std::vector<std::string> callbackTexts;
 
-    std::unique_ptr<OxMsg> start(const char* messages, const char* logName) {
+    std::unique_ptr<OxMsg> start(const std::string& messages, const char* logName) {
         oxtest::writeFile(dir.file("test.msg"), messages);
         auto msg = std::make_unique<OxMsg>(dir.file("test.msg").c_str(), nullptr, logName,
                                            dir.path().c_str());
         OxMsg::setMsgCallback(collect);
         OxMsg::setMsgCallbackUserData(&callbackTexts);
         return msg;
+    }
+    /// Stops the running subsystem (every OxMsg stops it when it goes), starts
+    /// one on `messages` and returns what went to standard error meanwhile.
+    std::string restart(std::unique_ptr<OxMsg>& msg, const std::string& messages,
+                        const char* logName = nullptr) {
+        return stderrOf([&] {
+            msg.reset();
+            msg = start(messages, logName);
+        });
     }
     std::string log() { return oxtest::readText(dir.file("run.log")); }
 };
@@ -66,14 +82,13 @@ TEST_F(OxMsgTest, LevelsThresholdAndErrorCode) {
     EXPECT_EQ(OxMsg::getErrorCode(), OxErrorNone);
     OxMsg::Log(3u, "x");
     EXPECT_EQ(OxMsg::getErrorCode(), OxErrorError);
-    OxMsg::Log(42u, 1);
+    OxMsg::Log(42u, 1); // a warning does not lower the code
     EXPECT_EQ(OxMsg::getErrorCode(), OxErrorError);
     OxMsg::LogError(4u);
     EXPECT_EQ(OxMsg::getErrorCode(), OxErrorSevere);
     OxMsg::Log(5u);
     EXPECT_EQ(OxMsg::getErrorCode(), OxErrorFatal);
     OxMsg::resetErrorCode();
-    EXPECT_EQ(OxMsg::getErrorCode(), OxErrorNone);
     OxMsg::Log(999u);
     EXPECT_EQ(OxMsg::getErrorCode(), OxErrorNone);
     std::string err = testing::internal::GetCapturedStderr();
@@ -85,9 +100,7 @@ TEST_F(OxMsgTest, LevelsThresholdAndErrorCode) {
 
 TEST_F(OxMsgTest, RoutingOfInfoMessages) {
     auto msg = start(kMessages, "run.log");
-    testing::internal::CaptureStderr();
-    OxMsg::Log(1u, "quiet");
-    EXPECT_EQ(testing::internal::GetCapturedStderr(), "");
+    EXPECT_EQ(stderrOf([] { OxMsg::Log(1u, "quiet"); }), "");
     testing::internal::CaptureStderr();
     OxMsg::LogForce(1u, "forced");
     OxMsg::setVerboseState(OxTrue);
@@ -103,32 +116,27 @@ TEST_F(OxMsgTest, RoutingOfInfoMessages) {
 
     // Finished texts: no number, no letter, no line end added.
     msg->openLogFile("second.log", dir.path().c_str());
-    testing::internal::CaptureStderr();
-    OxMsg::Log("plain text|");
-    OxMsg::LogForce("forced text|");
-    EXPECT_EQ(testing::internal::GetCapturedStderr(), "forced text|");
+    EXPECT_EQ(stderrOf([] {
+                  OxMsg::Log("plain text|");
+                  OxMsg::LogForce("forced text|");
+              }),
+              "forced text|");
     EXPECT_EQ(oxtest::readText(dir.file("second.log")), "plain text|forced text|");
 
-    testing::internal::CaptureStderr();
-    msg->openLogFile("  ", nullptr);
-    EXPECT_EQ(testing::internal::GetCapturedStderr(),
+    EXPECT_EQ(stderrOf([&msg] { msg->openLogFile("  ", nullptr); }),
               "Log file name is null.  No logging will be done.\n");
     EXPECT_EQ(msg->isLogFileOpen(), OxFalse);
 }
 
 TEST_F(OxMsgTest, FileFormatContinuationsWideNumbersAndLongTexts) {
-    std::string messages = std::string(kMessages) + "30 no delimiter here\n";
-    testing::internal::CaptureStderr();
-    auto msg = start(messages.c_str(), "run.log");
-    EXPECT_EQ(testing::internal::GetCapturedStderr(),
+    std::unique_ptr<OxMsg> msg;
+    EXPECT_EQ(restart(msg, std::string(kMessages) + "30 no delimiter here\n", "run.log"),
               " No message delimiter in message number 30.  Setting message type to unknown.\n"
               " No message delimiter in message number 30.  Setting message level to default "
               "value.\n");
     OxMsg::Log(12u);
     OxMsg::Log(1000u);
-    testing::internal::CaptureStderr();
-    OxMsg::Log(30u);
-    testing::internal::GetCapturedStderr();
+    stderrOf([] { OxMsg::Log(30u); });
     // The unknown type logs a blank letter; the two delimiter reads took "n"
     // and "o", so the text is what follows them.
     EXPECT_EQ(log(), " 12I: First line\n\t second line\n1000W: Wide\n 30 :  delimiter here\n");
@@ -155,62 +163,44 @@ TEST_F(OxMsgTest, TextBeyondTheLargestBufferIsCut) {
 }
 
 TEST_F(OxMsgTest, BadMessageFilesKeepWhatWasRead) {
-    std::string messages = "1,I,0Before\n" + std::string(6000, 'x') + "\n";
-    testing::internal::CaptureStderr();
-    auto msg = start(messages.c_str(), nullptr);
-    std::string err = testing::internal::GetCapturedStderr();
-    EXPECT_EQ(err, "Error reading message file " + dir.file("test.msg") + " at line 2\n");
+    const std::string readError =
+        "Error reading message file " + dir.file("test.msg") + " at line 2\n";
+    std::unique_ptr<OxMsg> msg;
+    EXPECT_EQ(restart(msg, "1,I,0Before\n" + std::string(6000, 'x') + "\n"), readError);
     ASSERT_EQ(OxMsg::isValid(), OxTrue);
     EXPECT_EQ(std::string(OxMsg::LogToString(1u, "")), "Before");
 
     std::string overlong = "1,I,0Kept\n2,I,0" + std::string(6000, 'y') + "\n3,I,0Lost\n";
-    testing::internal::CaptureStderr();
-    msg.reset(); // every OxMsg stops the subsystem when it goes
-    msg = start(overlong.c_str(), nullptr);
-    err = testing::internal::GetCapturedStderr();
-    EXPECT_EQ(err, "Error reading message file " + dir.file("test.msg") + " at line 2\n");
+    EXPECT_EQ(restart(msg, overlong), readError);
     EXPECT_EQ(std::string(OxMsg::LogToString(1u)), "Kept");
     // The text part of a line holds at most 5,119 characters.
     EXPECT_TRUE(std::string(OxMsg::LogToString(2u)) == std::string(5119, 'y'));
-    testing::internal::CaptureStderr();
-    EXPECT_EQ(OxMsg::LogToString(3u), nullptr);
-    testing::internal::GetCapturedStderr();
+    stderrOf([] { EXPECT_EQ(OxMsg::LogToString(3u), nullptr); });
 
     // Binary garbage, NUL bytes, a missing final line end: no crash.
     const char raw[] = "7,E,0ok\n\x01\x02\0\xff,,,\n9";
-    std::string garbage(raw, sizeof raw - 1);
-    testing::internal::CaptureStderr();
-    msg.reset(); // every OxMsg stops the subsystem when it goes
-    msg = start(garbage.c_str(), nullptr);
-    testing::internal::GetCapturedStderr();
+    restart(msg, std::string(raw, sizeof raw - 1));
     EXPECT_EQ(std::string(OxMsg::LogToString(7u)), "ok");
-    std::string truncated("8,E", 3);
-    testing::internal::CaptureStderr();
-    msg.reset(); // every OxMsg stops the subsystem when it goes
-    msg = start(truncated.c_str(), nullptr);
-    testing::internal::GetCapturedStderr();
+    restart(msg, "8,E");
     EXPECT_EQ(OxMsg::isValid(), OxTrue);
 }
 
 TEST_F(OxMsgTest, StartUpFailuresAndLookup) {
     // Logging before any subsystem started does nothing, silently.
-    testing::internal::CaptureStderr();
-    OxMsg::Log(1u, "x");
-    OxMsg::Log("text");
-    EXPECT_EQ(testing::internal::GetCapturedStderr(), "");
-
-    testing::internal::CaptureStderr();
-    { OxMsg missing(nullptr, nullptr, nullptr, nullptr); }
-    EXPECT_EQ(testing::internal::GetCapturedStderr(), "Message file name is NULL.\n");
+    EXPECT_EQ(stderrOf([] {
+                  OxMsg::Log(1u, "x");
+                  OxMsg::Log("text");
+              }),
+              "");
+    EXPECT_EQ(stderrOf([] { OxMsg missing(nullptr, nullptr, nullptr, nullptr); }),
+              "Message file name is NULL.\n");
 
     std::string cwd = std::filesystem::current_path().string();
-    testing::internal::CaptureStderr();
-    {
-        OxMsg absent("absent.msg", dir.path().c_str(), nullptr, nullptr);
-        EXPECT_EQ(OxMsg::isValid(), OxFalse);
-        OxMsg::Log("nothing");
-    }
-    EXPECT_EQ(testing::internal::GetCapturedStderr(),
+    EXPECT_EQ(stderrOf([this] {
+                  OxMsg absent("absent.msg", dir.path().c_str(), nullptr, nullptr);
+                  EXPECT_EQ(OxMsg::isValid(), OxFalse);
+                  OxMsg::Log("nothing");
+              }),
               "Unable to open absent.msg\nTried " + dir.file("absent.msg") +
                   " and absent.msg,\nin current working directory, " + cwd + "\n");
 
@@ -230,27 +220,22 @@ TEST_F(OxMsgTest, StartUpFailuresAndLookup) {
     }
     std::filesystem::current_path(cwd);
 
-    testing::internal::CaptureStderr();
-    {
-        oxtest::writeFile(dir.file("test.msg"), kMessages);
-        OxMsg badLog(dir.file("test.msg").c_str(), nullptr, "run.log",
-                     dir.file("no/such/dir").c_str());
-        EXPECT_EQ(OxMsg::isValid(), OxFalse);
-    }
-    EXPECT_EQ(testing::internal::GetCapturedStderr(),
+    oxtest::writeFile(dir.file("test.msg"), kMessages);
+    const std::string noDir = dir.file("no/such/dir");
+    EXPECT_EQ(stderrOf([&] {
+                  OxMsg badLog(dir.file("test.msg").c_str(), nullptr, "run.log", noDir.c_str());
+                  EXPECT_EQ(OxMsg::isValid(), OxFalse);
+              }),
               " Unable to open " + dir.file("no/such/dir/run.log") + "\n");
 
     // A second start while a failed one still stands reads into the same
     // table (its lines continue the known messages) and takes over what the
     // first took: nothing is leaked (LeakSanitizer watches the asan build).
-    testing::internal::CaptureStderr();
-    {
-        std::string noDir = dir.file("no/such/dir");
+    stderrOf([&] {
         OxMsg first(dir.file("test.msg").c_str(), nullptr, "run.log", noDir.c_str());
         OxMsg second(dir.file("test.msg").c_str(), nullptr, "run.log", noDir.c_str());
         EXPECT_EQ(OxMsg::isValid(), OxFalse);
-    }
-    testing::internal::GetCapturedStderr();
+    });
 }
 
 TEST_F(OxMsgTest, PlantedTextsNeverWriteOrReadMissingArguments) {
@@ -263,10 +248,8 @@ TEST_F(OxMsgTest, PlantedTextsNeverWriteOrReadMissingArguments) {
                           "566 offset %u: %s %s\n"
                           "293,E,0%1$s at %2$u\n"
                           "294,E,0%s %u-%u%%n\n";
-    testing::internal::CaptureStderr();
-    auto msg = start(planted, nullptr);
-    std::string reports = testing::internal::GetCapturedStderr();
-    EXPECT_EQ(reports,
+    std::unique_ptr<OxMsg> msg;
+    EXPECT_EQ(restart(msg, planted),
               " Message 9: a %n conversion in its text is refused and prints as %p.\n"
               " Message 1: its text does not fit the arguments the library passes; a safe text is "
               "used.\n"
@@ -305,23 +288,22 @@ TEST_F(OxMsgTest, ManyMessagesInAnyOrderAndLongContinuations) {
         messages += (i % 2 == 0 ? "50 " : "51 ") + piece + "\n";
         (i % 2 == 0 ? first : second) += "\n\t " + piece;
     }
-    auto msg = start(messages.c_str(), nullptr);
+    auto msg = start(messages, nullptr);
     for (unsigned int n = 100; n <= 3000; n += 7) {
         ASSERT_STREQ(OxMsg::LogToString(n), ("m" + std::to_string(n)).c_str());
     }
     EXPECT_EQ(std::string(OxMsg::LogToString(50u)), first);
     EXPECT_EQ(std::string(OxMsg::LogToString(51u)), second);
-    testing::internal::CaptureStderr();
-    EXPECT_EQ(OxMsg::LogToString(99u), nullptr);
-    EXPECT_EQ(OxMsg::LogToString(3001u), nullptr);
-    testing::internal::GetCapturedStderr();
+    stderrOf([] {
+        EXPECT_EQ(OxMsg::LogToString(99u), nullptr);
+        EXPECT_EQ(OxMsg::LogToString(3001u), nullptr);
+    });
 }
 
 TEST(OxDefaultMessageFile, LoadsWithoutReports) {
-    testing::internal::CaptureStderr();
-    {
-        OxMsg msg(oxtest::dataFile("oxbase.msg").c_str(), nullptr, nullptr, nullptr);
-        EXPECT_EQ(OxMsg::isValid(), OxTrue);
-    }
-    EXPECT_EQ(testing::internal::GetCapturedStderr(), "");
+    EXPECT_EQ(stderrOf([] {
+                  OxMsg msg(oxtest::dataFile("oxbase.msg").c_str(), nullptr, nullptr, nullptr);
+                  EXPECT_EQ(OxMsg::isValid(), OxTrue);
+              }),
+              "");
 }

@@ -136,18 +136,13 @@ TEST(OxPrtTest, FlushReachesCallbackAndLog) {
               std::string::npos);
 }
 
-TEST(OxPrtTest, TraceStreamAndThreshold) {
+TEST(OxPrtTest, TraceStreamIsRenewedWhenFlushed) {
     OxPrtInit();
     OxPrt::trace() << "trace line " << 1.5 << "\n";
     OxPrt::flushTrace(); // no message subsystem: dropped, and the stream is new
     std::ostrstream& after = OxPrt::trace();
     EXPECT_EQ(after.pcount(), 0);
     EXPECT_EQ(after.flags() & std::ios::fixed, std::ios::fmtflags());
-
-    unsigned int saved = OxPrt::getTraceThreshold();
-    OxPrt::setTraceThreshold(123);
-    EXPECT_EQ(OxPrt::getTraceThreshold(), 123u);
-    OxPrt::setTraceThreshold(saved);
 }
 
 TEST(OxPrtTest, FullAtTheBoundaryAndManyLargeFlushes) {
@@ -198,20 +193,17 @@ TEST(OxPrtTest, IndentationBounds) {
     EXPECT_EQ(OxPrt::indent[0], ' ');
     EXPECT_EQ(OxPrt::indent[2], '\0');
     EXPECT_EQ(OxPrt::indent[1], before);
-    OxPrt::adjustIndent(-2);
-    EXPECT_EQ(OxPrt::getIndent(), 0);
-    OxPrt::adjustIndent(-1);
-    EXPECT_EQ(OxPrt::getIndent(), 0);
-
-    OxPrt::setIndent(40);
-    EXPECT_EQ(OxPrt::getIndent(), 40);
-    OxPrt::adjustIndent(1);
-    EXPECT_EQ(OxPrt::getIndent(), 40);
-    OxPrt::setIndent(41);
-    OxPrt::setIndent(-1);
-    EXPECT_EQ(OxPrt::getIndent(), 40);
-    OxPrt::setIndent(3);
-    EXPECT_EQ(OxPrt::getIndent(), 3);
+    // Each step (set or adjust by) and the indentation after it: 0 to 40 only.
+    const struct {
+        bool set;
+        int value;
+        int indent;
+    } steps[] = {{false, -2, 0}, {false, -1, 0}, {true, 40, 40}, {false, 1, 40},
+                 {true, 41, 40}, {true, -1, 40}, {true, 3, 3}};
+    for (const auto& step : steps) {
+        step.set ? OxPrt::setIndent(step.value) : OxPrt::adjustIndent(step.value);
+        EXPECT_EQ(OxPrt::getIndent(), step.indent) << step.set << " " << step.value;
+    }
 
     // A dump line starts with curpos + 1 blanks, whatever the stream's fill.
     std::ostrstream stream;

@@ -190,7 +190,6 @@ TEST(OxBBox, CentreSizeAndComparison) {
     EXPECT_EQ(axes(boxf, &OxBBoxf::getCenter), (Three{1, 1, 1}));
     EXPECT_EQ(axes(box, &OxBBox::getSize), (Three{2, 3, 4}));
     EXPECT_EQ(axes(boxf, &OxBBoxf::getSize), (Three{2, 3, 4}));
-    EXPECT_EQ(center.x + half.z, 5.0); // the vectors are left alone
     EXPECT_EQ(axes(OxBBox(5, 5, 5, 1, 1, 1), &OxBBox::getSize), (Three{-2, -2, -2}));
     // The float box takes the difference in float, where it overflows.
     EXPECT_TRUE(std::isinf(axes(OxBBoxf(-3e38f, 0, 0, 3e38f, 0, 0), &OxBBoxf::getCenter)[0]));

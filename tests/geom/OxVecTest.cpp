@@ -74,9 +74,8 @@ TEST(OxVec, WeightedFormsAndHomogeneousOperations) {
     sum += OxVec3d(1, 1, 1); // Euclidean (2, 3, 4), weighted again by 2
     expectVec(sum, 4, 6, 8, 2);
 
-    OxVec3d plane(2, 4, 2);
     OxVec2d uv;
-    plane.getEuclidean(uv);
+    OxVec3d(2, 4, 2).getEuclidean(uv);
     EXPECT_EQ(uv.x, 1.0);
     EXPECT_EQ(uv.y, 2.0);
 }
@@ -98,12 +97,9 @@ TEST(OxVec, ArithmeticNormalisingAndAxes) {
     OxVec3d none;
     EXPECT_EQ(none.normalize(), 0.0);
 
-    OxVec3d axis = OxVec3d(1, -1, 0).getClosestAxis();
-    EXPECT_EQ(axis.x, 1.0);
-    axis = OxVec3d(0, -2, 1).getClosestAxis();
-    EXPECT_EQ(axis.y, 1.0);
-    axis = OxVec3d(1, -2, -3).getClosestAxis();
-    EXPECT_EQ(axis.z, 1.0);
+    EXPECT_EQ(OxVec3d(1, -1, 0).getClosestAxis().x, 1.0);
+    EXPECT_EQ(OxVec3d(0, -2, 1).getClosestAxis().y, 1.0);
+    EXPECT_EQ(OxVec3d(1, -2, -3).getClosestAxis().z, 1.0);
     EXPECT_EQ(OxVec3d().getClosestAxis().x, 1.0);
     EXPECT_EQ(OxVec2d(-3, 1).getClosestAxis().x, 1.0);
 
