@@ -127,20 +127,13 @@ OxBool OxCsvFile::readFile() {
         source.start(input->getFileLength());
         char* line = nullptr;
         size_t length = 0;
-        OxLineSource::Result got;
-        while ((got = source.next(line, length)) == OxLineSource::Line) {
+        while (source.next(line, length) == OxLineSource::Line) {
             if (source.lineMayHoldNul()) {
                 // The line ends at its first NUL byte.
                 auto* nul = static_cast<char*>(std::memchr(line, '\0', length));
                 length = nul != nullptr ? static_cast<size_t>(nul - line) : length;
             }
             takeLine(line, length, headerDone, records);
-        }
-        if (got == OxLineSource::End) {
-            // Leave the input at its end, as a line reader would: it is then
-            // no longer good, and a second read stops at once.
-            char probe[2];
-            input->getline(probe, sizeof probe, '\n');
         }
     });
     if (!read) {

@@ -43,6 +43,7 @@ public:
     }
 
     /// The next line without its line end, in place: `line` and `length`.
+    /// At End the input has been read to its end (eof set, no longer good).
     /// The byte behind the line may be overwritten by the caller.
     Result next(char*& line, size_t& length) {
         for (;;) {
@@ -64,6 +65,10 @@ public:
                     passNul();
                     return Line;
                 }
+                // Leave the input at its end, as a line reader would: it is
+                // then no longer good, and a second read stops at once.
+                char probe[2];
+                input.getline(probe, sizeof probe, '\n');
                 return End;
             }
             Result refill = fill();

@@ -112,10 +112,6 @@ OxBool OxXmlReader::run() {
         size_t length = 0;
         OxLineSource::Result got = source.next(line, length);
         if (got == OxLineSource::End) {
-            // Leave the input at its end, as a line reader would: it is then
-            // no longer good, and a second read stops at once.
-            char probe[2];
-            file.input->getline(probe, sizeof probe, '\n');
             break;
         }
         if (got == OxLineSource::ReadFailure) {
