@@ -119,8 +119,10 @@ OxBool OxCsvFile::readFile() {
             store = new OxXmlStore;
         }
         bool headerDone = presetColumns > 0;
-        setRoot(store->newElement("root", 4));
-        OxCsvRecords records(*store, *root, columnNames, separator);
+        OxXmlTagRecord* rootRecord =
+            store->newTag(store->tagShape(store->holdText("root"), nullptr, 0), nullptr, 0);
+        setRoot(OxXmlElement::fromRecord(rootRecord, true));
+        OxCsvRecords records(*store, *rootRecord, columnNames, separator);
         // Lines are taken out of large blocks, whole whatever their length;
         // a last line without a line end is a line too.
         OxLineSource source(*input);

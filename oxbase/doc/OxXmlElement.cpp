@@ -6,7 +6,7 @@
 #include "oxbase/diag/OxPrt.h"
 #include "oxbase/doc/OxXmlFile.h"
 #include "oxbase/doc/detail/OxXmlNames.h"
-#include "oxbase/doc/detail/OxXmlPendingAttributes.h"
+#include "oxbase/doc/detail/OxXmlRecords.h"
 #include "oxbase/geom/OxColor.h"
 #include "oxbase/geom/OxVec.h"
 
@@ -93,14 +93,14 @@ OxXmlElement::~OxXmlElement() {
     if ((storage & kStoredValue) == 0) {
         delete[] value;
     }
-    // Pending attributes are texts of the store and go with it.
+    // Pending attributes and children are records of the store and go with it.
     if ((storage & kPendingAttributes) == 0 && attributes != nullptr) {
         for (unsigned int i = 0; i < attributes->length; i++) {
             OxXmlAttribute::release(attributes->data[i]);
         }
         deleteList(attributes);
     }
-    if (children == nullptr) {
+    if ((storage & kPendingChildren) != 0 || children == nullptr) {
         return;
     }
     // The subtree goes without recursion, depth first over the child lists
@@ -128,9 +128,7 @@ OxXmlElement::~OxXmlElement() {
         while (depth > 0) {
             Level& top = levels[depth - 1];
             if (top.next == top.list->length) {
-                if ((top.owner->storage & kStoredChildren) == 0) {
-                    deleteList(top.list); // a stored list goes with the store
-                }
+                deleteList(top.list);
                 if (top.owner != this) {
                     release(top.owner);
                 }
@@ -141,7 +139,7 @@ OxXmlElement::~OxXmlElement() {
             if (child == nullptr) {
                 continue;
             }
-            if (child->children == nullptr) {
+            if ((child->storage & kPendingChildren) != 0 || child->children == nullptr) {
                 release(child);
             } else if (depth == kLevels) {
                 child->parent = waiting;
@@ -160,27 +158,50 @@ OxXmlElement::~OxXmlElement() {
 }
 
 void OxXmlElement::release(OxXmlElement* element) {
-    if (element == nullptr) {
-        return;
-    }
-    if ((element->storage & kStoredNode) != 0) {
-        element->~OxXmlElement(); // the memory goes with the store
-    } else {
-        delete element;
-    }
+    delete element;
 }
 
-OxXmlPendingAttributes* OxXmlElement::pendingPairs() const {
-    if ((storage & kPendingAttributes) == 0 || pending->kind != OxXmlPendingAttributes::kPairs) {
+OxXmlElement* OxXmlElement::fromRecord(OxXmlRecord* record, bool topLevel) {
+    if (record->shape->kind == OxXmlShape::kNode) {
+        auto* node = static_cast<OxXmlNodeRecord*>(record);
+        OxXmlElement* taken = node->node;
+        node->node = nullptr;
+        return taken;
+    }
+    auto* element = new OxXmlElement(static_cast<char const*>(nullptr));
+    element->name = record->shape->name;
+    element->storage = kHeldName | kStoredValue;
+    if (record->shape->kind == OxXmlShape::kCsv) {
+        if (static_cast<OxXmlCsvRecord*>(record)->count > 0) {
+            element->pending = record;
+            element->storage |= kPendingAttributes;
+        }
+        return element;
+    }
+    auto* tag = static_cast<OxXmlTagRecord*>(record);
+    element->value = tag->value;
+    if (tag->shape->count > 0) {
+        element->pending = record;
+        element->storage |= kPendingAttributes;
+    }
+    if (topLevel || tag->firstChild != nullptr) {
+        element->childRecords = record;
+        element->storage |= kPendingChildren;
+    }
+    return element;
+}
+
+OxXmlTagRecord* OxXmlElement::pendingTag() const {
+    if ((storage & kPendingAttributes) == 0 || pending->shape->kind != OxXmlShape::kTag) {
         return nullptr;
     }
-    return pending;
+    return static_cast<OxXmlTagRecord*>(pending);
 }
 
 void OxXmlElement::buildPendingAttributes() const {
     // Every allocation comes first: a failure leaves the attributes pending
-    // and the pending form untouched (the CSV form is read only once).
-    unsigned int count = pending->count;
+    // and the record untouched (the CSV form is read only once).
+    unsigned int count = getNbAttributes();
     OxGList<OxXmlAttribute*>* list = newList<OxXmlAttribute*>(count);
     unsigned int made = 0;
     try {
@@ -195,17 +216,61 @@ void OxXmlElement::buildPendingAttributes() const {
         throw;
     }
     unsigned int next = 0;
-    pending->forEach([list, &next](char const* attributeName, char* attributeValue) {
+    auto take = [list, &next](char const* attributeName, char* attributeValue) {
         OxXmlAttribute* attribute = list->data[next++];
         attribute->name = OxXmlNames::share(attributeName);
         attribute->value = attributeValue; // a text of the store
         attribute->storage = OxXmlAttribute::kStoredValue;
-    });
+    };
+    if (pending->shape->kind == OxXmlShape::kTag) {
+        static_cast<OxXmlTagRecord*>(pending)->forEachAttribute(take);
+    } else {
+        static_cast<OxXmlCsvRecord*>(pending)->forEachAttribute(take);
+    }
     list->length = count;
     // The element is no const object (see the header): its list is made here.
     auto* self = const_cast<OxXmlElement*>(this);
     self->attributes = list;
     self->storage &= static_cast<std::uint8_t>(~kPendingAttributes);
+}
+
+void OxXmlElement::buildPendingChildren() const {
+    // The new elements first, places left for the nodes of kNode records: a
+    // failure leaves the children pending and takes nothing from the store.
+    OxXmlRecord* first = static_cast<OxXmlTagRecord*>(childRecords)->firstChild;
+    unsigned int count = getNbChildElements();
+    OxGList<OxXmlElement*>* list = nullptr;
+    if (count > 0) {
+        list = newList<OxXmlElement*>(count);
+        unsigned int made = 0;
+        try {
+            for (OxXmlRecord* record = first; record != nullptr; record = record->next) {
+                bool node = record->shape->kind == OxXmlShape::kNode;
+                list->data[made++] = node ? nullptr : fromRecord(record, false);
+            }
+        } catch (const std::bad_alloc&) {
+            for (unsigned int i = 0; i < made; i++) {
+                delete list->data[i];
+            }
+            deleteList(list);
+            throw;
+        }
+        auto* self = const_cast<OxXmlElement*>(this);
+        unsigned int index = 0;
+        for (OxXmlRecord* record = first; record != nullptr; record = record->next, index++) {
+            if (record->shape->kind == OxXmlShape::kNode) {
+                list->data[index] = fromRecord(record, false);
+            }
+            if (list->data[index] != nullptr) {
+                list->data[index]->parent = self;
+            }
+        }
+        list->length = count;
+    }
+    // The element is no const object (see the header): its list is made here.
+    auto* self = const_cast<OxXmlElement*>(this);
+    self->children = list;
+    self->storage &= static_cast<std::uint8_t>(~kPendingChildren);
 }
 
 void OxXmlElement::addAttribute(OxXmlAttribute* attribute) {
@@ -225,27 +290,14 @@ void OxXmlElement::reserveAttributes(unsigned int count) {
 }
 
 void OxXmlElement::addChild(OxXmlElement* child) {
-    if (children == nullptr) {
+    if (childList() == nullptr) {
         children = newList<OxXmlElement*>(4);
-    } else if ((storage & kStoredChildren) != 0) {
-        // A stored list is exact: the list moves to the heap with room to grow.
-        OxGList<OxXmlElement*>* list = newList<OxXmlElement*>(children->length * 2 + 1);
-        try {
-            for (unsigned int i = 0; i < children->length; i++) {
-                list->append(children->data[i]); // within the capacity
-            }
-        } catch (const std::bad_alloc&) {
-            deleteList(list);
-            throw;
-        }
-        children = list;
-        storage &= static_cast<std::uint8_t>(~kStoredChildren);
     }
     children->append(child);
 }
 
 OxBool OxXmlElement::deleteChild(unsigned int index) {
-    if (children == nullptr) {
+    if (childList() == nullptr) {
         return OxTrue;
     }
     if (index >= children->length) {
@@ -260,7 +312,7 @@ OxBool OxXmlElement::deleteChild(unsigned int index) {
 }
 
 OxBool OxXmlElement::deleteChildren(char const* childName) {
-    if (childName == nullptr || children == nullptr) {
+    if (childName == nullptr || childList() == nullptr) {
         return OxTrue;
     }
     for (unsigned int i = 0; i < children->length; i++) {
@@ -276,12 +328,22 @@ OxBool OxXmlElement::deleteChildren(char const* childName) {
 
 unsigned int OxXmlElement::getNbAttributes() const {
     if ((storage & kPendingAttributes) != 0) {
-        return pending->count;
+        return pending->shape->kind == OxXmlShape::kTag
+                   ? pending->shape->count
+                   : static_cast<OxXmlCsvRecord*>(pending)->count;
     }
     return attributes != nullptr ? attributes->length : 0;
 }
 
 unsigned int OxXmlElement::getNbChildElements() const {
+    if ((storage & kPendingChildren) != 0) {
+        unsigned int count = 0;
+        for (OxXmlRecord* record = static_cast<OxXmlTagRecord*>(childRecords)->firstChild;
+             record != nullptr; record = record->next) {
+            count++;
+        }
+        return count;
+    }
     return children != nullptr ? children->length : 0;
 }
 
@@ -294,10 +356,11 @@ OxXmlAttribute* OxXmlElement::getAttribute(unsigned int index) const {
 }
 
 OxXmlElement* OxXmlElement::getChild(unsigned int index) const {
-    if (children == nullptr || index >= children->length) {
+    OxGList<OxXmlElement*>* list = childList();
+    if (list == nullptr || index >= list->length) {
         return nullptr;
     }
-    return children->data[index];
+    return list->data[index];
 }
 
 OxXmlAttribute* OxXmlElement::getAttributeByName(char const* attributeName) const {
@@ -323,7 +386,7 @@ char const* OxXmlElement::getAttributeValue(char const* attributeName) const {
 }
 
 OxXmlElement* OxXmlElement::getChildByName(char const* childName) const {
-    if (childName == nullptr || children == nullptr) {
+    if (childName == nullptr || childList() == nullptr) {
         return nullptr;
     }
     for (unsigned int i = 0; i < children->length; i++) {
@@ -337,7 +400,7 @@ OxXmlElement* OxXmlElement::getChildByName(char const* childName) const {
 
 OxGList<OxXmlElement const*> OxXmlElement::getChildrenByName(char const* childName) const {
     OxGList<OxXmlElement const*> found;
-    if (childName == nullptr || children == nullptr) {
+    if (childName == nullptr || childList() == nullptr) {
         return found;
     }
     for (unsigned int i = 0; i < children->length; i++) {
@@ -536,7 +599,7 @@ std::ostrstream* OxXmlElement::dump(std::ostrstream* stream) const {
     OxGList<Frame> stack;
     auto enter = [&stack, stream](OxXmlElement const* element) {
         element->dumpNode(*stream);
-        if (element->children != nullptr) {
+        if (element->childList() != nullptr) {
             OxPrt::adjustIndent(2);
             stack.append(Frame{element, 0});
         }

@@ -6,8 +6,8 @@
 // trees of any depth are destroyed, dumped and written without recursion.
 // Names are shared between elements and attributes of equal name, and the
 // elements themselves come from a pool, so that a large document costs
-// little more than its text. The attributes of a read element are built
-// when they are first needed (see "Pending attributes" below).
+// little more than its text. The attributes and children of a read element
+// are built when they are first needed (see "Pending nodes" below).
 //
 //   OxXmlElement * part = new OxXmlElement("part");
 //   part->addAttribute(new OxXmlAttribute("vec3d", OxVec3d(1, 2, 3)));
@@ -29,7 +29,10 @@ class OxXmlFile;
 class OxCsvFile;
 namespace oxbase {
 namespace detail {
-struct OxXmlPendingAttributes;
+class OxXmlReader;
+class OxXmlStore;
+struct OxXmlRecord;
+struct OxXmlTagRecord;
 } // namespace detail
 } // namespace oxbase
 
@@ -88,13 +91,14 @@ public:
     char const* getValue() const { return value; }
     char const* getXsiType() const { return xsiType; }
     XML_ELEMENT_TYPE getType() const { return type; }
-    /// List lengths, null slots counted; 0 without a list. Builds nothing.
+    /// List lengths, null slots counted; 0 without a list. Builds nothing
+    /// (pending children are counted by a walk over their records).
     unsigned int getNbAttributes() const;
     unsigned int getNbChildElements() const;
     /// The entry at `index`, or null (no list, index not below the length,
     /// or a null slot). This and every other operation that hands out or
-    /// changes attributes builds pending ones first (std::bad_alloc when
-    /// that fails, and they stay pending).
+    /// changes attributes or children builds pending ones first
+    /// (std::bad_alloc when that fails, and they stay pending).
     OxXmlAttribute* getAttribute(unsigned int index) const;
     OxXmlElement* getChild(unsigned int index) const;
     /// The first attribute named exactly `attributeName` (case matters), or null.
@@ -146,37 +150,46 @@ public:
     /// dump convention (without recursion). Returns `stream`.
     virtual std::ostrstream* dump(std::ostrstream* stream) const;
 
-    // ---- Pending attributes ----
+    // ---- Pending nodes ----
     //
-    // The readers leave the attributes of the elements they build pending:
-    // recorded compactly in the document's store, counted, but not yet
-    // objects (oxbase/doc/detail/OxXmlPendingAttributes.h). The first call
-    // that needs them as objects builds all of them at once, in list order,
-    // with the names and values they were read with; from then on they are
-    // ordinary attributes, and each pointer handed out stays valid as long
-    // as its attribute does. Building them is invisible but for its cost and
-    // for std::bad_alloc, which leaves them pending. Const getters build
-    // too: the objects are part of the element's state, not a change of it.
+    // The readers leave what they read as compact records in the document's
+    // store (oxbase/doc/detail/OxXmlRecords.h): an element made from a record
+    // has its attributes and its children pending, counted but not yet
+    // objects. The first call that needs the attributes as objects builds
+    // all of them at once, in list order, with the names and values they
+    // were read with; the first that needs the children builds every child
+    // of the element the same way (each with its own attributes and
+    // children pending). From then on they are ordinary objects, and each
+    // pointer handed out stays valid as long as its object does. Building
+    // is invisible but for its cost and for std::bad_alloc, which leaves
+    // them pending. Const getters build too: the objects are part of the
+    // element's state, not a change of it.
 
 private:
     friend class OxXmlFile;
     friend class OxCsvFile;
     friend class oxbase::detail::OxXmlStore;
-    /// Where the object and its parts live: bits of `storage`. A stored
-    /// element was built by a document's store (OxXmlStore) and goes with
-    /// it; a stored value is a text there, which setValue replaces by a heap
+    friend class oxbase::detail::OxXmlReader;
+    /// Where the parts of the object live: bits of `storage`. A stored value
+    /// is a text of a document's store, which setValue replaces by a heap
     /// copy, so callers see no difference. With pending attributes `pending`
-    /// is set instead of `attributes`; built attributes come from the heap
-    /// and keep their values in the store. A stored child list is an exact
-    /// array there, moved to the heap by addChild. A held name is one whose
-    /// use the store holds for the element (setName takes a use of its own).
+    /// is set instead of `attributes`, with pending children `childRecords`
+    /// instead of `children`: both are the element's record, and the
+    /// attributes built from it keep their values in the store. A held name
+    /// is one whose use the store holds for the element (setName takes a
+    /// use of its own).
     enum : std::uint8_t {
-        kStoredNode = 1,
         kStoredValue = 2,
         kPendingAttributes = 4,
-        kStoredChildren = 8,
+        kPendingChildren = 8,
         kHeldName = 16
     };
+    /// The node of `record` (a record of a document's store): a new element
+    /// for a tag or CSV record, its attributes and children pending; the
+    /// record's own node for a kNode record, which the caller takes over
+    /// from the store. `topLevel`: the record may still get children (the
+    /// reader makes a top-level element at its start tag).
+    static OxXmlElement* fromRecord(oxbase::detail::OxXmlRecord* record, bool topLevel);
     /// Destroys `element` and its subtree as their storage requires (null is
     /// ignored): the way a document and a parent end the nodes they own.
     static void release(OxXmlElement* element);
@@ -188,13 +201,22 @@ private:
         }
         return attributes;
     }
-    /// The pending attributes when they are the pairs of a read XML tag
-    /// (null otherwise), for the writer, which writes them as they stand.
-    oxbase::detail::OxXmlPendingAttributes* pendingPairs() const;
+    /// The child list, pending children built first (as attributeList).
+    OxGList<OxXmlElement*>* childList() const {
+        if ((storage & kPendingChildren) != 0) {
+            buildPendingChildren();
+        }
+        return children;
+    }
+    /// The record of the pending attributes when it is a read XML tag (null
+    /// otherwise), for the writer, which writes them as they stand.
+    oxbase::detail::OxXmlTagRecord* pendingTag() const;
     /// Turns the pending attributes into objects in a list of their own.
-    /// The element is never a const object: only the store makes pending
-    /// attributes, on the elements it builds.
+    /// The element is never a const object: only fromRecord makes pending
+    /// attributes and children, on the elements it builds.
     void buildPendingAttributes() const;
+    /// Turns the pending children into objects in a list of their own.
+    void buildPendingChildren() const;
     /// Reads up to `count` numbers of attribute `attributeName` into `numbers`.
     /// 1: all found; 0: attribute or value missing; -1: too few or no copy.
     int readNumbers(char const* attributeName, double* numbers, unsigned int count) const;
@@ -207,10 +229,13 @@ private:
     char const* name = nullptr; ///< shared with equal names (OxXmlNames)
     char* value = nullptr;
     OxXmlElement* parent = nullptr;
-    OxGList<OxXmlElement*>* children = nullptr;
+    union {
+        OxGList<OxXmlElement*>* children = nullptr;
+        oxbase::detail::OxXmlRecord* childRecords; ///< with kPendingChildren
+    };
     union {
         OxGList<OxXmlAttribute*>* attributes = nullptr;
-        oxbase::detail::OxXmlPendingAttributes* pending; ///< with kPendingAttributes
+        oxbase::detail::OxXmlRecord* pending; ///< with kPendingAttributes
     };
 };
 

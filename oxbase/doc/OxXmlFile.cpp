@@ -4,8 +4,8 @@
 #include "oxbase/core/detail/OxNoMemory.h"
 #include "oxbase/diag/OxMsg.h"
 #include "oxbase/diag/OxMsgNumbers.h"
-#include "oxbase/doc/detail/OxXmlPendingAttributes.h"
 #include "oxbase/doc/detail/OxXmlReader.h"
+#include "oxbase/doc/detail/OxXmlRecords.h"
 #include "oxbase/doc/detail/OxXmlStore.h"
 #include "oxbase/doc/detail/OxXmlTextBuffer.h"
 #include "oxbase/io/OxInput.h"
@@ -394,16 +394,59 @@ OxBool OxXmlFile::write(OxXmlElement const* element, OxXmlLineSink& sink) {
     // lines and the indentation steps are those of the natural recursion:
     // up by one behind a start tag with children (dropped beyond 20), down by
     // one before its end tag (dropped below 0), and on a failure the levels
-    // left early keep their step up.
+    // left early keep their step up. Children that nobody asked for are
+    // written straight from their records, without building them (see
+    // OxXmlElement): a frame then walks the records instead of a list.
     struct Frame {
-        OxXmlElement const* element;
+        OxXmlElement const* element; ///< null for a frame of records
         unsigned int next;
+        OxXmlRecord* record; ///< the next child record
+        char const* name;    ///< for the end tag
     };
     linePrt();
     OxGList<Frame> stack;
     LineBuffer line;
     enum Visit { Done, Opened, Failed };
-    auto visit = [&stack, &line, &sink](OxXmlElement const* node) -> Visit {
+    // The start tag of `name` with `value` and the attributes that
+    // `addAttributes` adds; then its children, if `hasChildren`, as `frame`.
+    auto tag = [&stack, &line, &sink](char const* name, char const* value, auto addAttributes,
+                                      bool hasChildren, Frame frame) -> Visit {
+        line.field(curpos + 1, OX_XML_START).add(name);
+        if (value != nullptr) {
+            line.add(OX_XML_END)
+                .add(value)
+                .add(OX_XML_START)
+                .add(OX_XML_NODE_END)
+                .add(name)
+                .add(OX_XML_END);
+            line.send(sink);
+            return Done;
+        }
+        if (!addAttributes()) {
+            line.discard(); // the line in progress is not sent
+            return Failed;
+        }
+        if (!hasChildren) {
+            line.add(OX_XML_NODE_END).add(OX_XML_END);
+            line.send(sink);
+            return Done;
+        }
+        line.add(OX_XML_END);
+        line.send(sink);
+        adjustIndent(1);
+        stack.append(frame);
+        return Opened;
+    };
+    // The attributes of a read tag that nobody asked for are written as
+    // they were read, without building them.
+    auto recordAttributes = [&line](OxXmlTagRecord* record) {
+        bool named = true;
+        record->forEachAttribute([&line, &named](char const* name, char const* value) {
+            named = named && line.addAttribute(name, value);
+        });
+        return named;
+    };
+    auto visit = [&tag, &line, &sink, &recordAttributes](OxXmlElement const* node) -> Visit {
         if (node == nullptr) {
             return Done;
         }
@@ -415,50 +458,63 @@ OxBool OxXmlFile::write(OxXmlElement const* element, OxXmlLineSink& sink) {
             sink.line(node->getValue(), std::strlen(node->getValue()));
             return Done;
         }
-        line.field(curpos + 1, OX_XML_START).add(node->getName());
-        if (node->getValue() != nullptr) {
-            line.add(OX_XML_END)
-                .add(node->getValue())
-                .add(OX_XML_START)
-                .add(OX_XML_NODE_END)
-                .add(node->getName())
-                .add(OX_XML_END);
-            line.send(sink);
-            return Done;
-        }
-        // The attributes of a read tag that nobody asked for are written as
-        // they were read, without building them (see OxXmlElement).
-        OxXmlPendingAttributes* tag = node->pendingPairs();
-        unsigned int count = node->getNbAttributes();
-        for (unsigned int i = 0; i < count; i++) {
-            bool named = true;
-            if (tag != nullptr) {
-                named = line.addAttribute(tag->pairs()[i].name, tag->pairs()[i].value);
-            } else if (OxXmlAttribute const* attribute = node->getAttribute(i)) {
-                named = line.addAttribute(*attribute);
+        auto attributes = [node, &line, &recordAttributes]() {
+            if (OxXmlTagRecord* record = node->pendingTag()) {
+                return recordAttributes(record);
             }
-            if (!named) {
-                line.discard(); // the line in progress is not sent
+            unsigned int count = node->getNbAttributes();
+            for (unsigned int i = 0; i < count; i++) {
+                OxXmlAttribute const* attribute = node->getAttribute(i);
+                if (attribute != nullptr && !line.addAttribute(*attribute)) {
+                    return false;
+                }
+            }
+            return true;
+        };
+        if ((node->storage & OxXmlElement::kPendingChildren) != 0) {
+            OxXmlRecord* first = static_cast<OxXmlTagRecord*>(node->childRecords)->firstChild;
+            return tag(node->getName(), node->getValue(), attributes, first != nullptr,
+                       Frame{nullptr, 0, first, node->getName()});
+        }
+        return tag(node->getName(), node->getValue(), attributes, node->getNbChildElements() != 0,
+                   Frame{node, 0, nullptr, node->getName()});
+    };
+    // A record of a read document (a CSV record never stands in an XML tree).
+    auto visitRecord = [&tag, &visit, &sink, &recordAttributes](OxXmlRecord* record) -> Visit {
+        if (record->shape->kind == OxXmlShape::kNode) {
+            return visit(static_cast<OxXmlNodeRecord*>(record)->node);
+        }
+        if (record->shape->kind != OxXmlShape::kTag) {
+            return Failed;
+        }
+        auto* read = static_cast<OxXmlTagRecord*>(record);
+        if (read->shape->name == nullptr) {
+            // A tag without a name is written as the raw node it reads as.
+            if (read->value == nullptr) {
                 return Failed;
             }
-        }
-        if (node->getNbChildElements() == 0) {
-            line.add(OX_XML_NODE_END).add(OX_XML_END);
-            line.send(sink);
+            sink.line(read->value, std::strlen(read->value));
             return Done;
         }
-        line.add(OX_XML_END);
-        line.send(sink);
-        adjustIndent(1);
-        stack.append(Frame{node, 0});
-        return Opened;
+        return tag(
+            read->shape->name, read->value,
+            [read, &recordAttributes]() { return recordAttributes(read); },
+            read->firstChild != nullptr, Frame{nullptr, 0, read->firstChild, read->shape->name});
     };
     if (visit(element) == Failed) {
         return OxFalse;
     }
     while (stack.length > 0) {
         Frame& top = stack.data[stack.length - 1];
-        if (top.next < top.element->getNbChildElements()) {
+        if (top.element == nullptr && top.record != nullptr) {
+            OxXmlRecord* child = top.record;
+            top.record = child->next;
+            if (visitRecord(child) == Failed) {
+                return OxFalse;
+            }
+            continue;
+        }
+        if (top.element != nullptr && top.next < top.element->getNbChildElements()) {
             OxXmlElement const* child = top.element->getChild(top.next++);
             if (visit(child) == Failed) {
                 return OxFalse;
@@ -466,10 +522,7 @@ OxBool OxXmlFile::write(OxXmlElement const* element, OxXmlLineSink& sink) {
             continue;
         }
         adjustIndent(-1);
-        line.field(curpos + 1, OX_XML_START)
-            .add(OX_XML_NODE_END)
-            .add(top.element->getName())
-            .add(OX_XML_END);
+        line.field(curpos + 1, OX_XML_START).add(OX_XML_NODE_END).add(top.name).add(OX_XML_END);
         line.send(sink);
         stack.length--;
     }

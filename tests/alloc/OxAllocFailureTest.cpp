@@ -280,6 +280,42 @@ TEST(AllocFailure, PendingAttributesAreBuiltWholeOrStayPending) {
     });
 }
 
+TEST(AllocFailure, PendingChildrenAreBuiltWholeOrStayPending) {
+    // The first use of a read element's children builds all of them;
+    // without memory it throws and leaves them as read, the comment object
+    // among them still the store's.
+    oxtest::TempDir dir;
+    oxtest::writeFile(dir.file("a.xml"), kDocument);
+    untilItRunsThrough([&](long long n) {
+        bool reached = false;
+        bool thrown = false;
+        std::string seen;
+        {
+            OxXmlFile xml(dir.file("a.xml").c_str(), OxFile::OxIOInput);
+            EXPECT_EQ(xml.readFile(), OxTrue);
+            const OxXmlElement* part = xml.getRoot()->getChild(1);
+            {
+                Armed armed(n);
+                try {
+                    part->getChild(0);
+                } catch (const std::bad_alloc&) {
+                    thrown = true;
+                }
+                reached = Armed::reached();
+            }
+            EXPECT_EQ(part->getNbChildElements(), 2u) << n;
+            const OxXmlElement* note = part->getChild(0);
+            const OxXmlElement* material = part->getChild(1);
+            EXPECT_EQ(note->getParent(), part) << n;
+            seen = std::string(note->getValue()) + ";" + material->getName() + "=" +
+                   material->getValue();
+        }
+        EXPECT_EQ(thrown, reached) << n;
+        EXPECT_EQ(seen, "<!-- a note\nover two lines -->;material=steel") << n;
+        return reached;
+    });
+}
+
 TEST(AllocFailure, MessageStartRunsOrDoesNot) {
     oxtest::TempDir dir;
     std::string messages = oxtest::dataFile("oxbase.msg");

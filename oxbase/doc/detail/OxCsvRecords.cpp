@@ -1,7 +1,5 @@
 #include "oxbase/doc/detail/OxCsvRecords.h"
 
-#include "oxbase/core/detail/OxNoMemory.h"
-#include "oxbase/doc/OxXmlElement.h"
 #include "oxbase/doc/detail/OxXmlNames.h"
 #include "oxbase/doc/detail/OxXmlStore.h"
 
@@ -11,11 +9,11 @@
 namespace oxbase {
 namespace detail {
 
-OxCsvRecords::OxCsvRecords(OxXmlStore& recordStore, OxXmlElement& recordRoot,
+OxCsvRecords::OxCsvRecords(OxXmlStore& recordStore, OxXmlTagRecord& recordRoot,
                            OxGList<char*> const& columnNames, char fieldSeparator)
     : store(recordStore), root(recordRoot), header(columnNames), separator(fieldSeparator) {
     columns = store.newColumns(separator);
-    recordName = store.holdText("record");
+    shape = store.csvShape(store.holdText("record"), columns);
 }
 
 void OxCsvRecords::cover(unsigned int positions) {
@@ -57,16 +55,13 @@ void OxCsvRecords::take(char const* line, std::size_t length) {
         covered = position + 1;
     }
     cover(covered);
-    OxXmlElement* record = store.newElementHeld(recordName);
-    bool placed = withMemory([&] {
-        store.setPendingLine(record, columns, count, line, length);
-        root.addChild(record);
-    });
-    if (!placed) {
-        OxXmlStore::discard(record);
-        throw std::bad_alloc();
+    OxXmlRecord* record = store.newCsv(shape, count, line, length);
+    if (last == nullptr) {
+        root.firstChild = record;
+    } else {
+        last->next = record;
     }
-    record->setParent(&root);
+    last = record;
 }
 
 } // namespace detail

@@ -1,23 +1,22 @@
 // OxCsvRecords.h: the records of a CSV read, built in the document's store.
 //
 // Each data line becomes an element "record" under the root, with one
-// attribute per non-empty field named after its column. A record is built in
-// the store (OxXmlStore) as the element and its trimmed line, with its
-// attributes pending (OxXmlPendingAttributes): they are counted here and
-// become objects only when a caller asks for them, so that reading a line
-// costs a scan and a copy. Each column's name is looked up once per read.
+// attribute per non-empty field named after its column. A record is left in
+// the store (OxXmlStore) as its trimmed line and its count of non-empty
+// fields (OxXmlCsvRecord), linked behind the one before: the elements and
+// their attributes are built only when a caller asks for them, so that
+// reading a line costs a scan and a copy. Each column's name is looked up
+// once per read.
 //
-//   OxCsvRecords records(store, *root, columnNames, ',');
+//   OxCsvRecords records(store, *rootRecord, columnNames, ',');
 //   records.take(line, length);   // a trimmed line, neither blank nor a comment
 #ifndef OXBASE_DOC_DETAIL_OXCSVRECORDS_H
 #define OXBASE_DOC_DETAIL_OXCSVRECORDS_H
 
 #include "oxbase/core/OxGList.h"
-#include "oxbase/doc/detail/OxXmlPendingAttributes.h"
+#include "oxbase/doc/detail/OxXmlRecords.h"
 
 #include <cstddef>
-
-class OxXmlElement;
 
 namespace oxbase {
 namespace detail {
@@ -26,11 +25,11 @@ class OxXmlStore;
 
 class OxCsvRecords {
 public:
-    /// Records go under `root` (a node of `store`), their fields are named
+    /// Records go under `root` (a record of `store`), their fields are named
     /// by `columnNames` as they are now (a field behind the last name is
     /// "column<N>", N its zero-based position). Both must outlive this
     /// object; the names taken from `columnNames` stay with the store.
-    OxCsvRecords(OxXmlStore& store, OxXmlElement& root, OxGList<char*> const& columnNames,
+    OxCsvRecords(OxXmlStore& store, OxXmlTagRecord& root, OxGList<char*> const& columnNames,
                  char separator);
     OxCsvRecords(const OxCsvRecords&) = delete;
     OxCsvRecords& operator=(const OxCsvRecords&) = delete;
@@ -46,11 +45,12 @@ private:
     void cover(unsigned int positions);
 
     OxXmlStore& store;
-    OxXmlElement& root;
+    OxXmlTagRecord& root;
+    OxXmlRecord* last = nullptr; ///< the last record so far
     OxGList<char*> const& header;
     OxCsvColumns* columns = nullptr;
     char separator;
-    char const* recordName = nullptr; ///< held by the store
+    OxXmlShape const* shape = nullptr; ///< "record", the columns
 };
 
 } // namespace detail

@@ -257,6 +257,7 @@ int OxXmlReader::doContent() {
     createElement(open, nameBegin, nameEnd, true);
     cursor = nameEnd + 1;
     if (*nameEnd == '>') {
+        commitTag(); // no attributes
         state = ELEMENT_VALUE;
         return kGoOn;
     }
@@ -276,7 +277,11 @@ int OxXmlReader::doElementValue() {
     char* open = find(cursor, '<');
     char* valueEnd = open != nullptr ? open : lineEnd;
     if (current != nullptr) {
-        store.setValue(current, cursor, static_cast<size_t>(valueEnd - cursor));
+        char* text = store.copyValue(cursor, static_cast<size_t>(valueEnd - cursor));
+        current->value = text;
+        if (OxXmlElement* element = frames.data[frames.length - 1].element) {
+            element->value = text; // kStoredValue since fromRecord
+        }
     }
     cursor = valueEnd;
     if (open == nullptr || open[1] != '/') {
@@ -316,7 +321,7 @@ int OxXmlReader::doAttribute() {
             if (p[1] != '>') {
                 return OxMsgXmlBadTagEnd;
             }
-            commitAttributes();
+            commitTag();
             if (current != nullptr) {
                 closeCurrent();
             }
@@ -335,7 +340,7 @@ int OxXmlReader::doAttribute() {
             continue;
         }
         case '>':
-            commitAttributes();
+            commitTag();
             cursor = p + 1;
             state = ELEMENT_VALUE;
             return kGoOn;
@@ -346,20 +351,21 @@ int OxXmlReader::doAttribute() {
 }
 
 void OxXmlReader::openAttribute(char* nameBegin, char* nameEnd) {
-    attributeOpen = false;
-    if (current == nullptr) {
+    endAttribute();
+    if (!tagOpen) {
         return;
     }
-    if (tagElement != current) {
-        commitAttributes();
-        tagElement = current;
-    }
-    OxXmlPendingPair pair{names.lookup(nameBegin, static_cast<size_t>(nameEnd - nameBegin)),
-                          nullptr};
-    tagPairs.append(pair);
-    // Its element gets it at the tag's end; its value comes next.
-    attribute = tagPairs.length - 1;
+    tagNames.append(names.lookup(nameBegin, static_cast<size_t>(nameEnd - nameBegin)));
+    // Its record gets it at the tag's end; its value comes next.
     attributeOpen = true;
+    valueSet = false;
+}
+
+void OxXmlReader::endAttribute() {
+    if (attributeOpen && !valueSet) {
+        tagValues.append(" ", 2); // no value (OxXmlTagRecord)
+    }
+    attributeOpen = false;
 }
 
 int OxXmlReader::doAttributeValue() {
@@ -480,31 +486,58 @@ int OxXmlReader::doDoctype() {
 }
 
 void OxXmlReader::createElement(char* tagStart, char* nameBegin, char* nameEnd, bool makeCurrent) {
-    commitAttributes();
-    OxXmlElement* element =
-        store.newElementHeld(names.lookup(nameBegin, static_cast<size_t>(nameEnd - nameBegin)));
-    // Until a place in the document has it, the element is destroyed when
-    // memory runs out.
-    bool placed = withMemory([&] {
+    commitTag();
+    tagName = names.lookup(nameBegin, static_cast<size_t>(nameEnd - nameBegin));
+    tagOpen = true;
+    tagMakeCurrent = makeCurrent;
+    if (current == nullptr && file.root != nullptr) {
+        // A second element at top level has no parent to go to: it is
+        // kept behind the root, where the writer writes it back.
+        OxMsg::Log(OxMsgXmlSecondTopLevel, fileName(), lineNumber, offsetOf(tagStart),
+                   nameOrEmpty(tagName));
+    }
+    if (!makeCurrent) {
+        commitTag(); // an empty element tag has no attributes
+    }
+}
+
+void OxXmlReader::commitTag() {
+    endAttribute();
+    if (!tagOpen) {
+        return;
+    }
+    OxXmlShape const* shape = store.tagShape(tagName, tagNames.data, tagNames.length);
+    OxXmlTagRecord* record = store.newTag(shape, tagValues.text(), tagValues.size());
+    tagOpen = false;
+    tagNames.length = 0;
+    tagValues.clear();
+    OxXmlElement* element = nullptr;
+    if (current != nullptr) {
+        link(record);
+    } else {
+        std::unique_ptr<OxXmlElement> made(OxXmlElement::fromRecord(record, true));
+        element = made.get();
         if (file.root == nullptr) {
-            file.root = element;
-        } else if (current != nullptr) {
-            addToCurrent(element);
+            file.root = made.release();
         } else {
-            // A second element at top level has no parent to go to: it is
-            // kept behind the root, where the writer writes it back.
-            OxMsg::Log(OxMsgXmlSecondTopLevel, fileName(), lineNumber, offsetOf(tagStart),
-                       nameOrEmpty(element->getName()));
             file.postRootNodes.append(element);
+            made.release(); // the list has it
         }
-    });
-    if (!placed) {
-        OxXmlStore::discard(element);
-        throw std::bad_alloc();
     }
-    if (makeCurrent) {
-        openElement(element);
+    if (tagMakeCurrent) {
+        frames.append(Frame{record, nullptr, element});
+        current = record;
     }
+}
+
+void OxXmlReader::link(OxXmlRecord* record) {
+    Frame& frame = frames.data[frames.length - 1];
+    if (frame.last == nullptr) {
+        frame.record->firstChild = record;
+    } else {
+        frame.last->next = record;
+    }
+    frame.last = record;
 }
 
 void OxXmlReader::closeByEndTag(char* tagStart, char* nameBegin) {
@@ -515,7 +548,7 @@ void OxXmlReader::closeByEndTag(char* tagStart, char* nameBegin) {
     while (nameEnd < lineEnd && *nameEnd != ' ' && *nameEnd != '>') {
         nameEnd++;
     }
-    char const* openName = nameOrEmpty(current->getName());
+    char const* openName = nameOrEmpty(current->shape->name);
     size_t length = static_cast<size_t>(nameEnd - nameBegin);
     if (std::strlen(openName) != length || std::strncmp(openName, nameBegin, length) != 0) {
         withText(nameBegin, nameEnd, [this, openName, tagStart](char const* endName) {
@@ -531,21 +564,12 @@ void OxXmlReader::attach(OxXmlElement* node) {
         return;
     }
     if (current != nullptr) {
-        addToCurrent(node);
+        link(store.newNode(node));
     } else if (file.root == nullptr) {
         file.preRootNodes.append(node);
     } else {
         file.postRootNodes.append(node);
     }
-}
-
-void OxXmlReader::commitAttributes() {
-    if (tagPairs.length > 0 && tagElement != nullptr) {
-        store.setPendingPairs(tagElement, tagPairs.data, tagPairs.length);
-    }
-    tagPairs.length = 0;
-    tagElement = nullptr;
-    attributeOpen = false;
 }
 
 void OxXmlReader::finishComment(bool cdata) {
@@ -568,7 +592,7 @@ void OxXmlReader::finish() {
     if (gathering && gatheredValid) {
         setAttributeValue(gathered.text(), gathered.size());
     }
-    commitAttributes();
+    commitTag();
     if (commentOpen[0]) {
         finishComment(false);
     }
@@ -583,31 +607,9 @@ void OxXmlReader::finish() {
     }
 }
 
-OxXmlReader::~OxXmlReader() {
-    // Children not yet handed to their element (a read left by
-    // std::bad_alloc) have no other owner.
-    for (unsigned int i = 0; i < openChildren.length; i++) {
-        OxXmlStore::discard(openChildren.data[i]);
-    }
-}
-
-void OxXmlReader::openElement(OxXmlElement* element) {
-    frames.append(Frame{element, openChildren.length});
-    current = element;
-}
-
 void OxXmlReader::closeCurrent() {
-    Frame frame = frames.data[frames.length - 1];
-    unsigned int count = openChildren.length - frame.first;
-    store.setChildren(frame.element, openChildren.data + frame.first, count);
-    openChildren.length = frame.first;
     frames.length--;
-    current = frames.length > 0 ? frames.data[frames.length - 1].element : nullptr;
-}
-
-void OxXmlReader::addToCurrent(OxXmlElement* node) {
-    openChildren.append(node);
-    node->setParent(current);
+    current = frames.length > 0 ? frames.data[frames.length - 1].record : nullptr;
 }
 
 } // namespace detail

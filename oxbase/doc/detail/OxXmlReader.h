@@ -7,7 +7,7 @@
 
 #include "oxbase/doc/OxXmlFile.h"
 #include "oxbase/doc/detail/OxLineSource.h"
-#include "oxbase/doc/detail/OxXmlPendingAttributes.h"
+#include "oxbase/doc/detail/OxXmlRecords.h"
 #include "oxbase/doc/detail/OxXmlStore.h"
 #include "oxbase/doc/detail/OxXmlTextBuffer.h"
 
@@ -40,6 +40,12 @@ namespace detail {
 /// Only the blank counts as space inside a tag. Nothing is decoded: values
 /// keep their bytes. Texts gathered over many lines grow in place and are
 /// stored once, so the work stays linear in the size of the input.
+///
+/// What is read is left as records in the document's store (OxXmlRecords.h):
+/// a tag becomes its record at its end, when its attributes are known, and
+/// is linked behind its elder sibling. Only the nodes at top level become
+/// objects at once (the root and what stands beside it); everything below
+/// them is built when a caller first asks for it.
 class OxXmlReader {
     /// The names of a document repeat: the raw text of a tag or attribute
     /// name is looked up here first, and the shared text (OxXmlNames) only
@@ -74,15 +80,13 @@ class OxXmlReader {
     };
 
 public:
-    /// Reads into `document`, whose store must exist: elements, attributes
-    /// and their values are built there.
+    /// Reads into `document`, whose store must exist: the records of the
+    /// nodes and their texts are left there.
     explicit OxXmlReader(OxXmlFile& document)
         : file(document), store(*document.store), names(*document.store), source(*document.input) {}
     OxXmlReader(const OxXmlReader&) = delete;
     OxXmlReader& operator=(const OxXmlReader&) = delete;
-    /// Children not yet handed to their element (a read left by
-    /// std::bad_alloc) are destroyed.
-    ~OxXmlReader();
+    ~OxXmlReader() = default;
 
     OxBool run();
 
@@ -131,28 +135,45 @@ private:
         store(begin);
         *end = saved;
     }
+    /// Opens the tag named [nameBegin, nameEnd): its record is made when its
+    /// attributes are known (commitTag), at once for an empty element tag
+    /// (`makeCurrent` false).
     void createElement(char* tagStart, char* nameBegin, char* nameEnd, bool makeCurrent);
     void closeByEndTag(char* tagStart, char* nameBegin);
+    /// Places `node`, a comment, CDATA or DOCTYPE object: in the current
+    /// element (the store owns it then), else beside the root. Without
+    /// memory std::bad_alloc, and the caller still owns it.
     void attach(OxXmlElement* node);
-    /// `element` becomes the current element; its children are gathered
-    /// until it closes.
-    void openElement(OxXmlElement* element);
-    /// Closes the current element: it gets its children as one exact list
-    /// in the store, and its parent becomes the current element.
+    /// Makes the record of the tag in progress, links it into the current
+    /// element or places its element at top level, and opens it when the
+    /// tag was a start tag.
+    void commitTag();
+    /// Links `record` behind the last child of the current element.
+    void link(OxXmlRecord* record);
+    /// Closes the current element; its parent becomes the current one.
     void closeCurrent();
-    /// Adds `node` to the children of the current element (there is one).
-    void addToCurrent(OxXmlElement* node);
-    /// Hands the attributes of the tag in progress to their element.
-    void commitAttributes();
-    /// Opens the attribute [nameBegin, nameEnd) of the current element (none
+    /// Opens the attribute [nameBegin, nameEnd) of the tag in progress (none
     /// without one): the attribute in progress, its value to come.
     void openAttribute(char* nameBegin, char* nameEnd);
+    /// Ends the attribute in progress: one without a value gets none.
+    void endAttribute();
 
-    /// Gives the attribute in progress the value [text, text + length).
+    /// Gives the attribute in progress the value [text, text + length),
+    /// trimmed: none for an empty text, an empty one for white space alone.
     void setAttributeValue(char const* text, size_t length) {
-        if (attributeOpen) {
-            tagPairs.data[attribute].value = store.copyValue(text, length);
+        if (!attributeOpen || valueSet) {
+            return;
         }
+        if (length == 0) {
+            tagValues.append(" ", 2); // no value (OxXmlTagRecord)
+        } else {
+            char const* first = text;
+            char const* last = text + length;
+            OxXmlNames::trim(first, last);
+            tagValues.append(first, static_cast<size_t>(last - first));
+            tagValues.append('\0');
+        }
+        valueSet = true;
     }
     void finishComment(bool cdata);
     void finish();
@@ -169,15 +190,16 @@ private:
     char* lineEnd = nullptr;
     char* cursor = nullptr;
 
-    OxXmlElement* current = nullptr;
-    // The open elements, outermost first, each with the place of its first
-    // child in openChildren: the children of all of them, in order.
+    // The open elements, outermost first: the record of each, its last
+    // child so far, and for one at top level its element (which gets the
+    // value too).
     struct Frame {
+        OxXmlTagRecord* record;
+        OxXmlRecord* last;
         OxXmlElement* element;
-        unsigned int first;
     };
     OxGList<Frame> frames;
-    OxGList<OxXmlElement*> openChildren;
+    OxXmlTagRecord* current = nullptr;
     // Comment and CDATA in progress: the node and its text so far.
     bool commentOpen[2] = {false, false};
     OxXmlElement* commentNode[2] = {nullptr, nullptr};
@@ -185,14 +207,18 @@ private:
     // The DOCTYPE text: gathered over the whole read, stored at its end.
     bool doctypeLoaded = false;
     OxXmlTextBuffer doctypeText;
-    // The attributes of the tag in progress (names and stored values),
-    // handed to their element at the tag's end as its pending attributes.
-    OxXmlElement* tagElement = nullptr;
-    OxGList<OxXmlPendingPair> tagPairs;
-    // The attribute in progress (an entry of tagPairs) and its value
-    // gathered over several lines.
+    // The tag in progress: its name, whether it is a start tag, and its
+    // attributes (their names, and their values laid out as its record
+    // keeps them).
+    bool tagOpen = false;
+    bool tagMakeCurrent = false;
+    char const* tagName = nullptr;
+    OxGList<char const*> tagNames;
+    OxXmlTextBuffer tagValues;
+    // The attribute in progress (the last of tagNames), whether it has its
+    // value, and its value gathered over several lines.
     bool attributeOpen = false;
-    unsigned int attribute = 0;
+    bool valueSet = false;
     char quote = '"';
     bool gatheredValid = false;
     bool gathering = false;

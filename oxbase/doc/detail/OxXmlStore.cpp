@@ -3,7 +3,6 @@
 #include "oxbase/doc/OxXmlAttribute.h"
 #include "oxbase/doc/OxXmlElement.h"
 #include "oxbase/doc/detail/OxXmlNames.h"
-#include "oxbase/doc/detail/OxXmlPendingAttributes.h"
 
 #include <cctype>
 #include <cstdint>
@@ -25,6 +24,10 @@ constexpr std::size_t kHeader = 16;
 } // namespace
 
 OxXmlStore::~OxXmlStore() {
+    // The nodes that no parent took first: they are objects of the heap.
+    for (unsigned int i = 0; i < nodes.length; i++) {
+        OxXmlElement::release(nodes.data[i]->node);
+    }
     // The oldest slab goes first. Slabs lie in the heap in the order they
     // were taken; freed newest first, each would come back to the top of the
     // heap and be handed back to the system on its own (a system call and a
@@ -43,6 +46,7 @@ OxXmlStore::~OxXmlStore() {
         delete[] reinterpret_cast<char*>(oldest);
         oldest = next;
     }
+    delete[] shapes;
     for (unsigned int i = 0; i < names.length; i++) {
         OxXmlNames::release(names.data[i]);
     }
@@ -52,10 +56,6 @@ OxXmlStore::~OxXmlStore() {
 }
 
 void OxXmlStore::grow(std::size_t size) {
-    newSlab(size, cursor, end);
-}
-
-void OxXmlStore::newSlab(std::size_t size, char*& areaCursor, char*& areaEnd) {
     nextSlabBytes = nextSlabBytes == 0 ? kFirstSlab : nextSlabBytes;
     std::size_t slabBytes = nextSlabBytes;
     while (slabBytes < kHeader + size) {
@@ -63,73 +63,128 @@ void OxXmlStore::newSlab(std::size_t size, char*& areaCursor, char*& areaEnd) {
     }
     char* memory = new char[slabBytes];
     slabs = new (memory) Slab{slabs};
-    areaCursor = memory + kHeader;
-    areaEnd = memory + slabBytes;
+    cursor = memory + kHeader;
+    end = memory + slabBytes;
     bytes += slabBytes;
     if (nextSlabBytes < kLargestSlab) {
         nextSlabBytes *= 2;
     }
 }
 
-void* OxXmlStore::allocateIn(std::size_t size, char*& areaCursor, char*& areaEnd) {
-    auto misalign = reinterpret_cast<std::uintptr_t>(areaCursor) % alignof(void*);
+void* OxXmlStore::allocate(std::size_t size) {
+    auto misalign = reinterpret_cast<std::uintptr_t>(cursor) % alignof(void*);
     std::size_t skip = misalign == 0 ? 0 : alignof(void*) - misalign;
-    if (areaCursor == nullptr || static_cast<std::size_t>(areaEnd - areaCursor) < skip + size) {
-        newSlab(size, areaCursor, areaEnd);
+    if (cursor == nullptr || static_cast<std::size_t>(end - cursor) < skip + size) {
+        grow(size);
         skip = 0;
     }
-    void* block = areaCursor + skip;
-    areaCursor += skip + size;
+    void* block = cursor + skip;
+    cursor += skip + size;
     return block;
 }
 
-void* OxXmlStore::allocate(std::size_t size) {
-    return allocateIn(size, cursor, end);
+namespace {
+std::size_t mixPointer(std::size_t hash, void const* pointer) {
+    auto bits = static_cast<std::uint64_t>(reinterpret_cast<std::uintptr_t>(pointer));
+    return static_cast<std::size_t>((hash ^ bits) * 0x9E3779B97F4A7C15ULL);
 }
+} // namespace
 
-OxXmlElement* OxXmlStore::newElement(char const* name, std::size_t length) {
-    void* memory = allocate(sizeof(OxXmlElement));
-    char const* shared = OxXmlNames::acquire(name, length);
-    auto* element = ::new (memory) OxXmlElement(static_cast<char const*>(nullptr));
-    element->name = shared;
-    element->storage = OxXmlElement::kStoredNode;
-    return element;
-}
-
-OxXmlElement* OxXmlStore::newElementHeld(char const* heldName) {
-    void* memory = allocate(sizeof(OxXmlElement));
-    auto* element = ::new (memory) OxXmlElement(static_cast<char const*>(nullptr));
-    element->name = heldName;
-    element->storage = OxXmlElement::kStoredNode | OxXmlElement::kHeldName;
-    return element;
-}
-
-void OxXmlStore::setChildren(OxXmlElement* element, OxXmlElement* const* list, unsigned int count) {
-    if (count == 0) {
-        return;
+OxXmlShape** OxXmlStore::findShape(char const* name, char const* const* attributeNames,
+                                   unsigned int count, std::size_t hash) {
+    std::size_t mask = shapeSlots - 1;
+    for (std::size_t slot = (hash >> 20) & mask;; slot = (slot + 1) & mask) {
+        OxXmlShape* shape = shapes[slot];
+        if (shape == nullptr || (shape->name == name && shape->count == count &&
+                                 (count == 0 || std::memcmp(shape->names(), attributeNames,
+                                                            count * sizeof(char const*)) == 0))) {
+            return &shapes[slot];
+        }
     }
-    using List = OxGList<OxXmlElement*>;
-    // The list object and its slots, one block; the slots are pointers.
-    // Lists have slabs of their own: a list is made when its element ends,
-    // and among the element's descendants it would stand in the way of
-    // everything that walks the tree in document order.
-    void* memory = allocateIn(sizeof(List) + count * sizeof(void*), listCursor, listEnd);
-    auto* stored = ::new (memory) List(0);
-    stored->data = reinterpret_cast<OxXmlElement**>(static_cast<char*>(memory) + sizeof(List));
-    std::memcpy(static_cast<void*>(stored->data), list, count * sizeof(void*));
-    stored->capacity = count;
-    stored->length = count;
-    element->children = stored;
-    element->storage |= OxXmlElement::kStoredChildren;
 }
 
-void OxXmlStore::setValue(OxXmlElement* element, char const* text, std::size_t length) {
-    char* copy = copyValue(text, length);
-    if ((element->storage & OxXmlElement::kStoredValue) == 0) {
-        delete[] element->value;
+void OxXmlStore::growShapes() {
+    std::size_t slots = shapeSlots == 0 ? 64 : shapeSlots * 2;
+    auto** bigger = new OxXmlShape*[slots]();
+    OxXmlShape** old = shapes;
+    std::size_t oldSlots = shapeSlots;
+    shapes = bigger;
+    shapeSlots = slots;
+    for (std::size_t i = 0; i < oldSlots; i++) {
+        OxXmlShape* shape = old[i];
+        if (shape != nullptr) {
+            std::size_t hash = mixPointer(0, shape->name);
+            for (std::uint32_t n = 0; n < shape->count; n++) {
+                hash = mixPointer(hash, shape->names()[n]);
+            }
+            *findShape(shape->name, shape->names(), shape->count, hash) = shape;
+        }
     }
-    element->value = copy;
-    element->storage |= OxXmlElement::kStoredValue;
+    delete[] old;
+}
+
+OxXmlShape const* OxXmlStore::tagShape(char const* name, char const* const* attributeNames,
+                                       unsigned int count) {
+    if ((shapeCount + 1) * 2 > shapeSlots) {
+        growShapes();
+    }
+    std::size_t hash = mixPointer(0, name);
+    for (unsigned int n = 0; n < count; n++) {
+        hash = mixPointer(hash, attributeNames[n]);
+    }
+    OxXmlShape** slot = findShape(name, attributeNames, count, hash);
+    if (*slot == nullptr) {
+        auto* shape = ::new (allocate(OxXmlShape::bytes(count)))
+            OxXmlShape{name, nullptr, count, OxXmlShape::kTag};
+        if (count > 0) {
+            std::memcpy(static_cast<void*>(shape->names()), attributeNames,
+                        count * sizeof(char const*));
+        }
+        *slot = shape;
+        shapeCount++;
+    }
+    return *slot;
+}
+
+OxXmlShape const* OxXmlStore::csvShape(char const* name, OxCsvColumns const* columns) {
+    return ::new (allocate(OxXmlShape::bytes(0))) OxXmlShape{name, columns, 0, OxXmlShape::kCsv};
+}
+
+OxXmlTagRecord* OxXmlStore::newTag(OxXmlShape const* shape, char const* values,
+                                   std::size_t length) {
+    void* memory = allocate(sizeof(OxXmlTagRecord) + length);
+    auto* tag = ::new (memory) OxXmlTagRecord;
+    tag->next = nullptr;
+    tag->shape = shape;
+    tag->firstChild = nullptr;
+    tag->value = nullptr;
+    if (length > 0) {
+        std::memcpy(tag->values(), values, length);
+    }
+    return tag;
+}
+
+OxXmlCsvRecord* OxXmlStore::newCsv(OxXmlShape const* shape, unsigned int count, char const* line,
+                                   std::size_t length) {
+    void* memory = allocate(sizeof(OxXmlCsvRecord) + length + 1);
+    auto* record = ::new (memory) OxXmlCsvRecord;
+    record->next = nullptr;
+    record->shape = shape;
+    record->count = count;
+    std::memcpy(record->line(), line, length);
+    record->line()[length] = '\0';
+    return record;
+}
+
+OxXmlNodeRecord* OxXmlStore::newNode(OxXmlElement* node) {
+    static const OxXmlShape kNodeShape{nullptr, nullptr, 0, OxXmlShape::kNode};
+    nodes.reserve(nodes.length + 1);
+    auto* record = ::new (allocate(sizeof(OxXmlNodeRecord))) OxXmlNodeRecord;
+    record->next = nullptr;
+    record->shape = &kNodeShape;
+    record->node = node;
+    nodes.append(record); // within the room made above
+    return record;
 }
 
 char const* OxXmlStore::holdName(char const* sharedName) {
@@ -156,37 +211,6 @@ OxCsvColumns* OxXmlStore::newColumns(char separator) {
     columns->separator = separator;
     tables.append(columns);
     return columns;
-}
-
-void OxXmlStore::setPendingPairs(OxXmlElement* element, OxXmlPendingPair const* pairs,
-                                 unsigned int count) {
-    if (count == 0) {
-        return;
-    }
-    void* memory = allocate(OxXmlPendingAttributes::pairsBytes(count));
-    auto* pending = ::new (memory) OxXmlPendingAttributes{count, OxXmlPendingAttributes::kPairs};
-    std::memcpy(static_cast<void*>(pending->pairs()), pairs, count * sizeof(OxXmlPendingPair));
-    element->pending = pending;
-    element->storage |= OxXmlElement::kPendingAttributes;
-}
-
-void OxXmlStore::setPendingLine(OxXmlElement* element, OxCsvColumns const* columns,
-                                unsigned int count, char const* line, std::size_t length) {
-    if (count == 0) {
-        return;
-    }
-    void* memory = allocate(OxXmlPendingAttributes::lineBytes(length));
-    auto* pending = ::new (memory) OxXmlPendingAttributes{count, OxXmlPendingAttributes::kCsvLine};
-    pending->columns() = columns;
-    char* text = pending->line();
-    std::memcpy(text, line, length);
-    text[length] = '\0';
-    element->pending = pending;
-    element->storage |= OxXmlElement::kPendingAttributes;
-}
-
-void OxXmlStore::discard(OxXmlElement* element) {
-    OxXmlElement::release(element);
 }
 
 } // namespace detail

@@ -1,29 +1,26 @@
-// OxXmlStore.h: the storage of the nodes and texts of a read document.
+// OxXmlStore.h: the storage of the records and texts of a read document.
 //
-// A read document holds many small objects: a 40 MB model has about half a
+// A read document holds many small things: a 40 MB model has about half a
 // million elements and more than a million attributes, each with a value
 // text. Taking each of them from the general heap costs a block header per
 // text, a walk of the heap to free each one, and memory that is never
-// touched together. The readers of OxXmlFile and OxCsvFile therefore build
-// their nodes in a store that the document owns: elements, value texts, the
-// pending attributes of each element (OxXmlPendingAttributes) and the exact
-// child lists of read elements are carved one behind the other out of large
-// slabs, in reading order, and the slabs go back to the heap at once when
-// the document goes.
+// touched together. The readers of OxXmlFile and OxCsvFile therefore leave
+// what they read in a store that the document owns: the records of the
+// nodes (OxXmlRecords.h), their shapes and their value texts are carved one
+// behind the other out of large slabs, in reading order, and the slabs go
+// back to the heap at once when the document goes.
 //
 //   OxXmlStore store;
-//   OxXmlElement * record = store.newElement("record", 6);
-//   store.setPendingPairs(record, pairs, 2);   // its two attributes, pending
-//   // ... the tree is destroyed (OxXmlElement::release), then the store
+//   OxXmlShape const* shape = store.tagShape(name, names, 2);
+//   OxXmlTagRecord* tag = store.newTag(shape, "1\0" "2\0", 4);
+//   // ... the tree is destroyed, then the store
 //
-// Nothing of this is visible to callers: a stored node behaves as any other.
-// It owns its texts logically (they live exactly as long as the node can),
-// getValue gives a stable pointer, setValue replaces a stored text by a heap
-// copy, and pending attributes become objects when they are first needed. A
-// node knows that it is stored by a flag; the document destroys its tree
-// before its store, and a stored node is never handed to the heap's delete.
-// The store holds one use of every name that a pending attribute or a read
-// element refers to, and the column names of each CSV read.
+// Nothing of this is visible to callers: the elements built from records
+// behave as any other. Their texts live exactly as long as the nodes can
+// (the document destroys its tree before its store), getValue gives a
+// stable pointer, and setValue replaces a stored text by a heap copy. The
+// store holds one use of every name that a record refers to, and owns the
+// objects of kNode records that no parent has taken.
 //
 // Without memory std::bad_alloc, and nothing is taken from the store.
 #ifndef OXBASE_DOC_DETAIL_OXXMLSTORE_H
@@ -31,6 +28,7 @@
 
 #include "oxbase/core/OxGList.h"
 #include "oxbase/doc/detail/OxXmlNames.h"
+#include "oxbase/doc/detail/OxXmlRecords.h"
 
 #include <cstddef>
 #include <cstring>
@@ -40,28 +38,33 @@ class OxXmlElement;
 namespace oxbase {
 namespace detail {
 
-struct OxCsvColumns;
-struct OxXmlPendingPair;
-
 class OxXmlStore {
 public:
     OxXmlStore() = default;
     OxXmlStore(const OxXmlStore&) = delete;
     OxXmlStore& operator=(const OxXmlStore&) = delete;
-    /// Gives every slab, name and column table back. The nodes built here
-    /// must be gone before.
+    /// Gives every slab, name, shape and column table back, and deletes the
+    /// objects of kNode records that no parent took. The elements built from
+    /// records must be gone before.
     ~OxXmlStore();
 
-    /// An element (XML_TYPE_ELEMENT) named by the shared text of the
-    /// `length` characters at `name` (trimmed; none when empty).
-    OxXmlElement* newElement(char const* name, std::size_t length);
-    /// The same with a name that this store holds (holdName): the element
-    /// takes no use of its own.
-    OxXmlElement* newElementHeld(char const* heldName);
-    /// Gives `element` (of this store, without children) the `count`
-    /// children at `list` as an exact list in the store. Nothing for a count
-    /// of 0.
-    void setChildren(OxXmlElement* element, OxXmlElement* const* list, unsigned int count);
+    /// The shape of the tags named `name` (held here, or null) with the
+    /// `count` attributes named `names` (held here), in this order: the same
+    /// object for every tag alike.
+    OxXmlShape const* tagShape(char const* name, char const* const* names, unsigned int count);
+    /// A shape for the records of one CSV read, named `name` (held here).
+    OxXmlShape const* csvShape(char const* name, OxCsvColumns const* columns);
+    /// A tag of `shape`, without sibling, children or value, followed by the
+    /// `length` bytes at `values` (the attribute values as OxXmlTagRecord
+    /// lays them out).
+    OxXmlTagRecord* newTag(OxXmlShape const* shape, char const* values, std::size_t length);
+    /// A CSV record of `shape` with `count` non-empty fields and the
+    /// `length` characters at `line`.
+    OxXmlCsvRecord* newCsv(OxXmlShape const* shape, unsigned int count, char const* line,
+                           std::size_t length);
+    /// A kNode record of `node`, which the store owns from then on (and the
+    /// caller still when this fails).
+    OxXmlNodeRecord* newNode(OxXmlElement* node);
     /// A copy of [text, text + length) trimmed as setValue trims, in the
     /// store: null for length 0, an empty text for white space alone.
     char* copyValue(char const* text, std::size_t length) {
@@ -81,10 +84,8 @@ public:
         cursor += count + 1;
         return copy;
     }
-    /// The same for the value of a stored element.
-    void setValue(OxXmlElement* element, char const* text, std::size_t length);
     /// Holds one use of `sharedName` (OxXmlNames) until the store goes, so
-    /// that pending attributes may refer to it; returns it.
+    /// that records may refer to it; returns it.
     char const* holdName(char const* sharedName);
     /// The shared text of `text` (OxXmlNames::acquire, null for a null or
     /// empty text), held by the store until it goes.
@@ -92,19 +93,6 @@ public:
     /// Column names for the records of one CSV read, to be filled by the
     /// caller with names it holds here; they go with the store.
     OxCsvColumns* newColumns(char separator);
-    /// Gives `element` (of this store, without attributes) the `count`
-    /// attributes of `pairs` as pending attributes; their names must be held
-    /// here. Nothing for a count of 0.
-    void setPendingPairs(OxXmlElement* element, OxXmlPendingPair const* pairs, unsigned int count);
-    /// Gives `element` (of this store, without attributes) the `count`
-    /// non-empty fields of the `length` characters of `line` (a trimmed CSV
-    /// line), named by `columns`, as pending attributes. Nothing for a count
-    /// of 0.
-    void setPendingLine(OxXmlElement* element, OxCsvColumns const* columns, unsigned int count,
-                        char const* line, std::size_t length);
-
-    /// Destroys an element (stored or not) that no place in a document holds.
-    static void discard(OxXmlElement* element);
 
     /// Bytes of slabs taken from the heap.
     std::size_t getBytes() const { return bytes; }
@@ -112,13 +100,15 @@ public:
 private:
     /// `size` bytes aligned for a pointer.
     void* allocate(std::size_t size);
-    /// Makes room for `size` bytes at `cursor`.
+    /// Makes room for `size` bytes at `cursor`: a new slab of at least `size`
+    /// bytes (and a header).
     void grow(std::size_t size);
-    /// A new slab of at least `size` bytes (and a header) for the area that
-    /// `areaCursor` and `areaEnd` describe.
-    void newSlab(std::size_t size, char*& areaCursor, char*& areaEnd);
-    /// `size` bytes aligned for a pointer in that area.
-    void* allocateIn(std::size_t size, char*& areaCursor, char*& areaEnd);
+    /// The slot of `shapes` for the shape (name, names, count): the one that
+    /// holds it or the empty one where it goes.
+    OxXmlShape** findShape(char const* name, char const* const* names, unsigned int count,
+                           std::size_t hash);
+    /// Doubles the table of shapes.
+    void growShapes();
 
     struct Slab {
         Slab* next;
@@ -126,12 +116,16 @@ private:
     Slab* slabs = nullptr;
     char* cursor = nullptr;
     char* end = nullptr;
-    char* listCursor = nullptr; ///< the area of the child lists
-    char* listEnd = nullptr;
     std::size_t nextSlabBytes = 0;
     std::size_t bytes = 0;
     OxGList<char const*> names{0};
     OxGList<OxCsvColumns*> tables{0};
+    OxGList<OxXmlNodeRecord*> nodes{0};
+    /// The tag shapes, open addressing over a power of two of slots, at most
+    /// half of them used.
+    OxXmlShape** shapes = nullptr;
+    std::size_t shapeSlots = 0;
+    std::size_t shapeCount = 0;
 };
 
 } // namespace detail
