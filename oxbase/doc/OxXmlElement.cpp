@@ -7,6 +7,7 @@
 #include "oxbase/doc/OxXmlFile.h"
 #include "oxbase/doc/detail/OxXmlNames.h"
 #include "oxbase/doc/detail/OxXmlRecords.h"
+#include "oxbase/doc/detail/OxXmlStore.h"
 #include "oxbase/geom/OxColor.h"
 #include "oxbase/geom/OxVec.h"
 
@@ -128,7 +129,9 @@ OxXmlElement::~OxXmlElement() {
         while (depth > 0) {
             Level& top = levels[depth - 1];
             if (top.next == top.list->length) {
-                deleteList(top.list);
+                if ((top.owner->storage & kStoredChildren) == 0) {
+                    deleteList(top.list); // a stored list goes with the store
+                }
                 if (top.owner != this) {
                     release(top.owner);
                 }
@@ -158,7 +161,14 @@ OxXmlElement::~OxXmlElement() {
 }
 
 void OxXmlElement::release(OxXmlElement* element) {
-    delete element;
+    if (element == nullptr) {
+        return;
+    }
+    if ((element->storage & kStoredNode) != 0) {
+        element->~OxXmlElement(); // the memory goes with the store
+    } else {
+        delete element;
+    }
 }
 
 OxXmlElement* OxXmlElement::fromRecord(OxXmlRecord* record, bool topLevel) {
@@ -168,9 +178,9 @@ OxXmlElement* OxXmlElement::fromRecord(OxXmlRecord* record, bool topLevel) {
         node->node = nullptr;
         return taken;
     }
-    auto* element = new OxXmlElement(static_cast<char const*>(nullptr));
+    OxXmlElement* element = record->shape->store->newElement();
     element->name = record->shape->name;
-    element->storage = kHeldName | kStoredValue;
+    element->storage |= kHeldName | kStoredValue;
     if (record->shape->kind == OxXmlShape::kCsv) {
         if (static_cast<OxXmlCsvRecord*>(record)->count > 0) {
             element->pending = record;
@@ -236,23 +246,23 @@ void OxXmlElement::buildPendingAttributes() const {
 
 void OxXmlElement::buildPendingChildren() const {
     // The new elements first, places left for the nodes of kNode records: a
-    // failure leaves the children pending and takes nothing from the store.
+    // failure leaves the children pending and takes nothing from the store
+    // (what was made there stays there, unused).
     OxXmlRecord* first = static_cast<OxXmlTagRecord*>(childRecords)->firstChild;
     unsigned int count = getNbChildElements();
     OxGList<OxXmlElement*>* list = nullptr;
     if (count > 0) {
-        list = newList<OxXmlElement*>(count);
-        unsigned int made = 0;
+        list = childRecords->shape->store->newChildList(count);
         try {
             for (OxXmlRecord* record = first; record != nullptr; record = record->next) {
                 bool node = record->shape->kind == OxXmlShape::kNode;
-                list->data[made++] = node ? nullptr : fromRecord(record, false);
+                OxXmlElement* made = node ? nullptr : fromRecord(record, false);
+                list->data[list->length++] = made;
             }
         } catch (const std::bad_alloc&) {
-            for (unsigned int i = 0; i < made; i++) {
-                delete list->data[i];
+            for (unsigned int i = 0; i < list->length; i++) {
+                release(list->data[i]);
             }
-            deleteList(list);
             throw;
         }
         auto* self = const_cast<OxXmlElement*>(this);
@@ -265,12 +275,14 @@ void OxXmlElement::buildPendingChildren() const {
                 list->data[index]->parent = self;
             }
         }
-        list->length = count;
     }
     // The element is no const object (see the header): its list is made here.
     auto* self = const_cast<OxXmlElement*>(this);
     self->children = list;
     self->storage &= static_cast<std::uint8_t>(~kPendingChildren);
+    if (list != nullptr) {
+        self->storage |= kStoredChildren;
+    }
 }
 
 void OxXmlElement::addAttribute(OxXmlAttribute* attribute) {
@@ -292,6 +304,19 @@ void OxXmlElement::reserveAttributes(unsigned int count) {
 void OxXmlElement::addChild(OxXmlElement* child) {
     if (childList() == nullptr) {
         children = newList<OxXmlElement*>(4);
+    } else if ((storage & kStoredChildren) != 0) {
+        // A stored list is exact: the list moves to the heap with room to grow.
+        OxGList<OxXmlElement*>* list = newList<OxXmlElement*>(children->length * 2 + 1);
+        try {
+            for (unsigned int i = 0; i < children->length; i++) {
+                list->append(children->data[i]); // within the capacity
+            }
+        } catch (const std::bad_alloc&) {
+            deleteList(list);
+            throw;
+        }
+        children = list;
+        storage &= static_cast<std::uint8_t>(~kStoredChildren);
     }
     children->append(child);
 }

@@ -170,22 +170,26 @@ private:
     friend class OxCsvFile;
     friend class oxbase::detail::OxXmlStore;
     friend class oxbase::detail::OxXmlReader;
-    /// Where the parts of the object live: bits of `storage`. A stored value
-    /// is a text of a document's store, which setValue replaces by a heap
-    /// copy, so callers see no difference. With pending attributes `pending`
+    /// Where the object and its parts live: bits of `storage`. A stored
+    /// element was made in a document's store (OxXmlStore) and goes with it;
+    /// a stored value is a text there, which setValue replaces by a heap
+    /// copy, so callers see no difference; a stored child list is an exact
+    /// array there, moved to the heap by addChild. With pending attributes `pending`
     /// is set instead of `attributes`, with pending children `childRecords`
     /// instead of `children`: both are the element's record, and the
     /// attributes built from it keep their values in the store. A held name
     /// is one whose use the store holds for the element (setName takes a
     /// use of its own).
     enum : std::uint8_t {
+        kStoredNode = 1,
         kStoredValue = 2,
         kPendingAttributes = 4,
         kPendingChildren = 8,
-        kHeldName = 16
+        kHeldName = 16,
+        kStoredChildren = 32
     };
     /// The node of `record` (a record of a document's store): a new element
-    /// for a tag or CSV record, its attributes and children pending; the
+    /// of that store for a tag or CSV record, its attributes and children pending; the
     /// record's own node for a kNode record, which the caller takes over
     /// from the store. `topLevel`: the record may still get children (the
     /// reader makes a top-level element at its start tag).

@@ -281,11 +281,15 @@ TEST(AllocFailure, PendingAttributesAreBuiltWholeOrStayPending) {
 }
 
 TEST(AllocFailure, PendingChildrenAreBuiltWholeOrStayPending) {
-    // The first use of a read element's children builds all of them;
-    // without memory it throws and leaves them as read, the comment object
-    // among them still the store's.
+    // The first use of a read element's children builds all of them (here
+    // more than a slab of the store holds); without memory it throws and
+    // leaves them as read, the comment object among them still the store's.
     oxtest::TempDir dir;
-    oxtest::writeFile(dir.file("a.xml"), kDocument);
+    std::string text = "<?xml version=\"1.0\"?>\n<r>\n<!-- a note -->\n";
+    for (int i = 0; i < 3000; i++) {
+        text += "<p i=\"" + std::to_string(i) + "\"/>\n";
+    }
+    oxtest::writeFile(dir.file("a.xml"), text + "</r>\n");
     untilItRunsThrough([&](long long n) {
         bool reached = false;
         bool thrown = false;
@@ -293,25 +297,26 @@ TEST(AllocFailure, PendingChildrenAreBuiltWholeOrStayPending) {
         {
             OxXmlFile xml(dir.file("a.xml").c_str(), OxFile::OxIOInput);
             EXPECT_EQ(xml.readFile(), OxTrue);
-            const OxXmlElement* part = xml.getRoot()->getChild(1);
+            const OxXmlElement* root = xml.getRoot();
             {
                 Armed armed(n);
                 try {
-                    part->getChild(0);
+                    root->getChild(0);
                 } catch (const std::bad_alloc&) {
                     thrown = true;
                 }
                 reached = Armed::reached();
             }
-            EXPECT_EQ(part->getNbChildElements(), 2u) << n;
-            const OxXmlElement* note = part->getChild(0);
-            const OxXmlElement* material = part->getChild(1);
-            EXPECT_EQ(note->getParent(), part) << n;
-            seen = std::string(note->getValue()) + ";" + material->getName() + "=" +
-                   material->getValue();
+            EXPECT_EQ(root->getNbChildElements(), 3001u) << n;
+            const OxXmlElement* note = root->getChild(0);
+            const OxXmlElement* last = root->getChild(3000);
+            EXPECT_EQ(note->getParent(), root) << n;
+            EXPECT_EQ(last->getParent(), root) << n;
+            seen = std::string(note->getValue()) + ";" + last->getName() + "=" +
+                   last->getAttributeValue("i");
         }
         EXPECT_EQ(thrown, reached) << n;
-        EXPECT_EQ(seen, "<!-- a note\nover two lines -->;material=steel") << n;
+        EXPECT_EQ(seen, "<!-- a note -->;p=2999") << n;
         return reached;
     });
 }

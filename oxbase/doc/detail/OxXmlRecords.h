@@ -43,6 +43,8 @@ class OxXmlElement;
 namespace oxbase {
 namespace detail {
 
+class OxXmlStore;
+
 /// The column names of one CSV read: one shared name per field position
 /// (null for an empty header field), held by the store, and the separator.
 /// Positions behind the header get "column<N>".
@@ -51,8 +53,8 @@ struct OxCsvColumns {
     OxGList<char const*> names{0};
 };
 
-/// What the records of one kind of node have in common: their kind, the
-/// element type and name, and for tags the names of their attributes (an
+/// What the records of one kind of node have in common: their kind and
+/// store, the element name, and for tags the names of their attributes (an
 /// array of `count` shared names behind the shape), for CSV records the
 /// columns. Every name is held by the store.
 struct OxXmlShape {
@@ -60,6 +62,7 @@ struct OxXmlShape {
 
     char const* name;
     OxCsvColumns const* columns; ///< kCsv
+    OxXmlStore* store;           ///< where the records and their nodes live
     std::uint32_t count;         ///< kTag: attributes of every tag of the shape
     Kind kind;
 

@@ -56,6 +56,10 @@ OxXmlStore::~OxXmlStore() {
 }
 
 void OxXmlStore::grow(std::size_t size) {
+    newSlab(size, cursor, end);
+}
+
+void OxXmlStore::newSlab(std::size_t size, char*& areaCursor, char*& areaEnd) {
     nextSlabBytes = nextSlabBytes == 0 ? kFirstSlab : nextSlabBytes;
     std::size_t slabBytes = nextSlabBytes;
     while (slabBytes < kHeader + size) {
@@ -63,24 +67,49 @@ void OxXmlStore::grow(std::size_t size) {
     }
     char* memory = new char[slabBytes];
     slabs = new (memory) Slab{slabs};
-    cursor = memory + kHeader;
-    end = memory + slabBytes;
+    areaCursor = memory + kHeader;
+    areaEnd = memory + slabBytes;
     bytes += slabBytes;
     if (nextSlabBytes < kLargestSlab) {
         nextSlabBytes *= 2;
     }
 }
 
-void* OxXmlStore::allocate(std::size_t size) {
-    auto misalign = reinterpret_cast<std::uintptr_t>(cursor) % alignof(void*);
+void* OxXmlStore::allocateIn(std::size_t size, char*& areaCursor, char*& areaEnd) {
+    auto misalign = reinterpret_cast<std::uintptr_t>(areaCursor) % alignof(void*);
     std::size_t skip = misalign == 0 ? 0 : alignof(void*) - misalign;
-    if (cursor == nullptr || static_cast<std::size_t>(end - cursor) < skip + size) {
-        grow(size);
+    if (areaCursor == nullptr || static_cast<std::size_t>(areaEnd - areaCursor) < skip + size) {
+        newSlab(size, areaCursor, areaEnd);
         skip = 0;
     }
-    void* block = cursor + skip;
-    cursor += skip + size;
+    void* block = areaCursor + skip;
+    areaCursor += skip + size;
     return block;
+}
+
+void* OxXmlStore::allocate(std::size_t size) {
+    return allocateIn(size, cursor, end);
+}
+
+OxXmlElement* OxXmlStore::newElement() {
+    // Elements and child lists are made when a caller first asks for them,
+    // and go to areas of their own: the walks over a built tree (the
+    // destruction above all) then run through memory in order.
+    void* memory = allocateIn(sizeof(OxXmlElement), nodeCursor, nodeEnd);
+    auto* element = ::new (memory) OxXmlElement(static_cast<char const*>(nullptr));
+    element->storage = OxXmlElement::kStoredNode;
+    return element;
+}
+
+OxGList<OxXmlElement*>* OxXmlStore::newChildList(unsigned int count) {
+    using List = OxGList<OxXmlElement*>;
+    // The list object and its slots, one block; the slots are pointers.
+    void* memory = allocateIn(sizeof(List) + count * sizeof(void*), nodeCursor, nodeEnd);
+    auto* list = ::new (memory) List(0);
+    list->data = reinterpret_cast<OxXmlElement**>(static_cast<char*>(memory) + sizeof(List));
+    list->capacity = count;
+    list->length = 0;
+    return list;
 }
 
 namespace {
@@ -135,7 +164,7 @@ OxXmlShape const* OxXmlStore::tagShape(char const* name, char const* const* attr
     OxXmlShape** slot = findShape(name, attributeNames, count, hash);
     if (*slot == nullptr) {
         auto* shape = ::new (allocate(OxXmlShape::bytes(count)))
-            OxXmlShape{name, nullptr, count, OxXmlShape::kTag};
+            OxXmlShape{name, nullptr, this, count, OxXmlShape::kTag};
         if (count > 0) {
             std::memcpy(static_cast<void*>(shape->names()), attributeNames,
                         count * sizeof(char const*));
@@ -147,7 +176,8 @@ OxXmlShape const* OxXmlStore::tagShape(char const* name, char const* const* attr
 }
 
 OxXmlShape const* OxXmlStore::csvShape(char const* name, OxCsvColumns const* columns) {
-    return ::new (allocate(OxXmlShape::bytes(0))) OxXmlShape{name, columns, 0, OxXmlShape::kCsv};
+    return ::new (allocate(OxXmlShape::bytes(0)))
+        OxXmlShape{name, columns, this, 0, OxXmlShape::kCsv};
 }
 
 OxXmlTagRecord* OxXmlStore::newTag(OxXmlShape const* shape, char const* values,
@@ -177,7 +207,7 @@ OxXmlCsvRecord* OxXmlStore::newCsv(OxXmlShape const* shape, unsigned int count, 
 }
 
 OxXmlNodeRecord* OxXmlStore::newNode(OxXmlElement* node) {
-    static const OxXmlShape kNodeShape{nullptr, nullptr, 0, OxXmlShape::kNode};
+    static const OxXmlShape kNodeShape{nullptr, nullptr, nullptr, 0, OxXmlShape::kNode};
     nodes.reserve(nodes.length + 1);
     auto* record = ::new (allocate(sizeof(OxXmlNodeRecord))) OxXmlNodeRecord;
     record->next = nullptr;

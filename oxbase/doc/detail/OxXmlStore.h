@@ -65,6 +65,12 @@ public:
     /// A kNode record of `node`, which the store owns from then on (and the
     /// caller still when this fails).
     OxXmlNodeRecord* newNode(OxXmlElement* node);
+    /// An element (XML_TYPE_ELEMENT, no name) in the store: it goes with
+    /// the store, its destructor alone is run (OxXmlElement::release).
+    OxXmlElement* newElement();
+    /// An empty child list with room for exactly `count` children, in the
+    /// store (OxXmlElement moves it to the heap when it has to grow).
+    OxGList<OxXmlElement*>* newChildList(unsigned int count);
     /// A copy of [text, text + length) trimmed as setValue trims, in the
     /// store: null for length 0, an empty text for white space alone.
     char* copyValue(char const* text, std::size_t length) {
@@ -100,9 +106,13 @@ public:
 private:
     /// `size` bytes aligned for a pointer.
     void* allocate(std::size_t size);
-    /// Makes room for `size` bytes at `cursor`: a new slab of at least `size`
-    /// bytes (and a header).
+    /// Makes room for `size` bytes at `cursor`.
     void grow(std::size_t size);
+    /// A new slab of at least `size` bytes (and a header) for the area that
+    /// `areaCursor` and `areaEnd` describe.
+    void newSlab(std::size_t size, char*& areaCursor, char*& areaEnd);
+    /// `size` bytes aligned for a pointer in that area.
+    void* allocateIn(std::size_t size, char*& areaCursor, char*& areaEnd);
     /// The slot of `shapes` for the shape (name, names, count): the one that
     /// holds it or the empty one where it goes.
     OxXmlShape** findShape(char const* name, char const* const* names, unsigned int count,
@@ -116,6 +126,8 @@ private:
     Slab* slabs = nullptr;
     char* cursor = nullptr;
     char* end = nullptr;
+    char* nodeCursor = nullptr; ///< the area of built elements and lists
+    char* nodeEnd = nullptr;
     std::size_t nextSlabBytes = 0;
     std::size_t bytes = 0;
     OxGList<char const*> names{0};
