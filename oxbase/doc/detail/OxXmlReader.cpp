@@ -515,13 +515,16 @@ void OxXmlReader::commitTag() {
     if (current != nullptr) {
         link(record);
     } else {
-        std::unique_ptr<OxXmlElement> made(OxXmlElement::fromRecord(record, true));
-        element = made.get();
+        element = OxXmlElement::fromRecord(record, true);
         if (file.root == nullptr) {
-            file.root = made.release();
+            file.root = element;
         } else {
-            file.postRootNodes.append(element);
-            made.release(); // the list has it
+            try {
+                file.postRootNodes.append(element);
+            } catch (const std::bad_alloc&) {
+                OxXmlElement::release(element); // an element of the store
+                throw;
+            }
         }
     }
     if (tagMakeCurrent) {
