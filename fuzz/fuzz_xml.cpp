@@ -16,6 +16,9 @@
 //   - T2 and T3 have the same tree: names, types, values, attributes with a
 //     value (one without a value has no written form) and children;
 //   - W2 and W3 are the same bytes.
+// And for every input: T1 written before any of its nodes was asked for
+// (straight from the reader's records) gives the same answer and the same
+// bytes as after every node was built.
 //
 // Documents with these features are only read, dumped and written, not
 // checked, because the described behaviour breaks even that property:
@@ -260,8 +263,15 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, size_t size) {
     static const std::string written[] = {oxfuzz::scratchFile("write1.xml"),
                                           oxfuzz::scratchFile("write2.xml"),
                                           oxfuzz::scratchFile("write3.xml")};
+    static const std::string untouchedOut = oxfuzz::scratchFile("untouched.xml");
     oxfuzz::writeFile(input, data, size);
 
+    OxBool untouchedWrite = OxFalse;
+    {
+        OxXmlFile untouched(input.c_str(), OxFile::OxIOInput);
+        untouched.readFile();
+        untouchedWrite = writeTo(untouched, untouchedOut);
+    }
     OxXmlFile first(input.c_str(), OxFile::OxIOInput);
     bool clean = readCleanly(first);
     bool secondTopLevel = oxfuzz::wasLogged(OxMsgXmlSecondTopLevel);
@@ -270,6 +280,12 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, size_t size) {
     first.dump(&dumped);
     dumped.freeze(false);
     OxBool firstWrite = writeTo(first, written[0]);
+    OXFUZZ_CHECK(firstWrite == untouchedWrite, "writeFile answered %d untouched, %d built",
+                 untouchedWrite, firstWrite);
+    OXFUZZ_CHECK(oxfuzz::readFile(untouchedOut) == oxfuzz::readFile(written[0]),
+                 "the writes before and after building differ:\n%s\n----\n%s",
+                 oxfuzz::shown(oxfuzz::readFile(untouchedOut), 2000).c_str(),
+                 oxfuzz::shown(oxfuzz::readFile(written[0]), 2000).c_str());
     if (!clean) {
         return 0;
     }
