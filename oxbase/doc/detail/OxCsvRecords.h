@@ -1,4 +1,4 @@
-// OxCsvRecords.h: the records of a CSV read, built in the document's store.
+// OxCsvRecords.h: the records of a CSV read, left in the document's store.
 //
 // Each data line becomes an element "record" under the root, with one
 // attribute per non-empty field named after its column. A record is left in

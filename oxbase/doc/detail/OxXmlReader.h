@@ -54,7 +54,7 @@ class OxXmlReader {
     class NameCache {
     public:
         /// Every name new to the cache is also held by `store`, for the
-        /// pending attributes that refer to it.
+        /// records and shapes that refer to it.
         explicit NameCache(OxXmlStore& nameStore) : store(nameStore) {}
         NameCache(const NameCache&) = delete;
         NameCache& operator=(const NameCache&) = delete;
