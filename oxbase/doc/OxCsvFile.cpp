@@ -119,8 +119,8 @@ OxBool OxCsvFile::readFile() {
             store = new OxXmlStore;
         }
         bool headerDone = presetColumns > 0;
-        OxXmlTagRecord* rootRecord =
-            store->newTag(store->tagShape(store->holdText("root"), nullptr, 0), nullptr, 0);
+        auto* rootRecord = static_cast<OxXmlTagRecord*>(store->newTag(
+            store->tagShape(store->holdText("root"), nullptr, 0, OxXmlShape::kTag), nullptr, 0));
         setRoot(OxXmlElement::fromRecord(rootRecord, true));
         OxCsvRecords records(*store, *rootRecord, columnNames, separator);
         // Lines are taken out of large blocks, whole whatever their length;

@@ -188,24 +188,24 @@ OxXmlElement* OxXmlElement::fromRecord(OxXmlRecord* record, bool topLevel) {
         }
         return element;
     }
-    auto* tag = static_cast<OxXmlTagRecord*>(record);
-    element->value = tag->value;
-    if (tag->shape->count > 0) {
+    element->value = record->value();
+    if (record->shape->count > 0) {
         element->pending = record;
         element->storage |= kPendingAttributes;
     }
-    if (topLevel || tag->firstChild != nullptr) {
+    bool start = record->shape->kind == OxXmlShape::kTag;
+    if (start && (topLevel || record->firstChild() != nullptr)) {
         element->childRecords = record;
         element->storage |= kPendingChildren;
     }
     return element;
 }
 
-OxXmlTagRecord* OxXmlElement::pendingTag() const {
-    if ((storage & kPendingAttributes) == 0 || pending->shape->kind != OxXmlShape::kTag) {
+OxXmlRecord* OxXmlElement::pendingTag() const {
+    if ((storage & kPendingAttributes) == 0 || !pending->shape->isTag()) {
         return nullptr;
     }
-    return static_cast<OxXmlTagRecord*>(pending);
+    return pending;
 }
 
 void OxXmlElement::buildPendingAttributes() const {
@@ -232,8 +232,8 @@ void OxXmlElement::buildPendingAttributes() const {
         attribute->value = attributeValue; // a text of the store
         attribute->storage = OxXmlAttribute::kStoredValue;
     };
-    if (pending->shape->kind == OxXmlShape::kTag) {
-        static_cast<OxXmlTagRecord*>(pending)->forEachAttribute(take);
+    if (pending->shape->isTag()) {
+        pending->forEachTagAttribute(take);
     } else {
         static_cast<OxXmlCsvRecord*>(pending)->forEachAttribute(take);
     }
@@ -248,13 +248,31 @@ void OxXmlElement::buildPendingChildren() const {
     // The new elements first, places left for the nodes of kNode records: a
     // failure leaves the children pending and takes nothing from the store
     // (what was made there stays there, unused).
-    OxXmlRecord* first = static_cast<OxXmlTagRecord*>(childRecords)->firstChild;
+    OxXmlRecord* first = childRecords->firstChild();
     unsigned int count = getNbChildElements();
     OxGList<OxXmlElement*>* list = nullptr;
     if (count > 0) {
-        list = childRecords->shape->store->newChildList(count);
+        OxXmlStore* store = childRecords->shape->store;
+        list = store->newChildList(count);
         try {
             for (OxXmlRecord* record = first; record != nullptr; record = record->next) {
+                if (record->shape->kind == OxXmlShape::kCsv) {
+                    // A block: one record and element per line.
+                    auto* block = static_cast<OxXmlCsvBlock*>(record);
+                    char* line = block->text();
+                    for (std::uint32_t i = 0; i < block->lines; i++) {
+                        std::size_t length = std::strlen(line);
+                        unsigned int fields = 0;
+                        unsigned int covered = 0;
+                        countCsvFields(line, length, block->shape->columns->separator, fields,
+                                       covered);
+                        OxXmlRecord* one = store->newCsvRecord(block->shape, fields, line);
+                        OxXmlElement* made = fromRecord(one, false);
+                        list->data[list->length++] = made;
+                        line += length + 1;
+                    }
+                    continue;
+                }
                 bool node = record->shape->kind == OxXmlShape::kNode;
                 OxXmlElement* made = node ? nullptr : fromRecord(record, false);
                 list->data[list->length++] = made;
@@ -265,14 +283,21 @@ void OxXmlElement::buildPendingChildren() const {
             }
             throw;
         }
-        auto* self = const_cast<OxXmlElement*>(this);
         unsigned int index = 0;
-        for (OxXmlRecord* record = first; record != nullptr; record = record->next, index++) {
+        for (OxXmlRecord* record = first; record != nullptr; record = record->next) {
+            if (record->shape->kind == OxXmlShape::kCsv) {
+                index += static_cast<OxXmlCsvBlock*>(record)->lines;
+                continue;
+            }
             if (record->shape->kind == OxXmlShape::kNode) {
                 list->data[index] = fromRecord(record, false);
             }
-            if (list->data[index] != nullptr) {
-                list->data[index]->parent = self;
+            index++;
+        }
+        auto* self = const_cast<OxXmlElement*>(this);
+        for (unsigned int i = 0; i < list->length; i++) {
+            if (list->data[i] != nullptr) {
+                list->data[i]->parent = self;
             }
         }
     }
@@ -353,9 +378,8 @@ OxBool OxXmlElement::deleteChildren(char const* childName) {
 
 unsigned int OxXmlElement::getNbAttributes() const {
     if ((storage & kPendingAttributes) != 0) {
-        return pending->shape->kind == OxXmlShape::kTag
-                   ? pending->shape->count
-                   : static_cast<OxXmlCsvRecord*>(pending)->count;
+        return pending->shape->isTag() ? pending->shape->count
+                                       : static_cast<OxXmlCsvRecord*>(pending)->count;
     }
     return attributes != nullptr ? attributes->length : 0;
 }
@@ -363,9 +387,11 @@ unsigned int OxXmlElement::getNbAttributes() const {
 unsigned int OxXmlElement::getNbChildElements() const {
     if ((storage & kPendingChildren) != 0) {
         unsigned int count = 0;
-        for (OxXmlRecord* record = static_cast<OxXmlTagRecord*>(childRecords)->firstChild;
-             record != nullptr; record = record->next) {
-            count++;
+        for (OxXmlRecord* record = childRecords->firstChild(); record != nullptr;
+             record = record->next) {
+            count += record->shape->kind == OxXmlShape::kCsv
+                         ? static_cast<OxXmlCsvBlock*>(record)->lines
+                         : 1;
         }
         return count;
     }

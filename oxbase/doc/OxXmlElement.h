@@ -32,7 +32,6 @@ namespace detail {
 class OxXmlReader;
 class OxXmlStore;
 struct OxXmlRecord;
-struct OxXmlTagRecord;
 } // namespace detail
 } // namespace oxbase
 
@@ -214,7 +213,7 @@ private:
     }
     /// The record of the pending attributes when it is a read XML tag (null
     /// otherwise), for the writer, which writes them as they stand.
-    oxbase::detail::OxXmlTagRecord* pendingTag() const;
+    oxbase::detail::OxXmlRecord* pendingTag() const;
     /// Turns the pending attributes into objects in a list of their own.
     /// The element is never a const object: only fromRecord makes pending
     /// attributes and children, on the elements it builds.

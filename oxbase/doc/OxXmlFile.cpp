@@ -439,9 +439,9 @@ OxBool OxXmlFile::write(OxXmlElement const* element, OxXmlLineSink& sink) {
     };
     // The attributes of a read tag that nobody asked for are written as
     // they were read, without building them.
-    auto recordAttributes = [&line](OxXmlTagRecord* record) {
+    auto recordAttributes = [&line](OxXmlRecord* record) {
         bool named = true;
-        record->forEachAttribute([&line, &named](char const* name, char const* value) {
+        record->forEachTagAttribute([&line, &named](char const* name, char const* value) {
             named = named && line.addAttribute(name, value);
         });
         return named;
@@ -459,7 +459,7 @@ OxBool OxXmlFile::write(OxXmlElement const* element, OxXmlLineSink& sink) {
             return Done;
         }
         auto attributes = [node, &line, &recordAttributes]() {
-            if (OxXmlTagRecord* record = node->pendingTag()) {
+            if (OxXmlRecord* record = node->pendingTag()) {
                 return recordAttributes(record);
             }
             unsigned int count = node->getNbAttributes();
@@ -472,7 +472,7 @@ OxBool OxXmlFile::write(OxXmlElement const* element, OxXmlLineSink& sink) {
             return true;
         };
         if ((node->storage & OxXmlElement::kPendingChildren) != 0) {
-            OxXmlRecord* first = static_cast<OxXmlTagRecord*>(node->childRecords)->firstChild;
+            OxXmlRecord* first = node->childRecords->firstChild();
             return tag(node->getName(), node->getValue(), attributes, first != nullptr,
                        Frame{nullptr, 0, first, node->getName()});
         }
@@ -484,22 +484,23 @@ OxBool OxXmlFile::write(OxXmlElement const* element, OxXmlLineSink& sink) {
         if (record->shape->kind == OxXmlShape::kNode) {
             return visit(static_cast<OxXmlNodeRecord*>(record)->node);
         }
-        if (record->shape->kind != OxXmlShape::kTag) {
+        if (!record->shape->isTag()) {
             return Failed;
         }
-        auto* read = static_cast<OxXmlTagRecord*>(record);
+        OxXmlRecord* read = record;
         if (read->shape->name == nullptr) {
             // A tag without a name is written as the raw node it reads as.
-            if (read->value == nullptr) {
+            if (read->value() == nullptr) {
                 return Failed;
             }
-            sink.line(read->value, std::strlen(read->value));
+            sink.line(read->value(), std::strlen(read->value()));
             return Done;
         }
         return tag(
-            read->shape->name, read->value,
+            read->shape->name, read->value(),
             [read, &recordAttributes]() { return recordAttributes(read); },
-            read->firstChild != nullptr, Frame{nullptr, 0, read->firstChild, read->shape->name});
+            read->firstChild() != nullptr,
+            Frame{nullptr, 0, read->firstChild(), read->shape->name});
     };
     if (visit(element) == Failed) {
         return OxFalse;

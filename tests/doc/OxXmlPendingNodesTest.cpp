@@ -152,6 +152,7 @@ const char* const kNested = "<?xml version=\"1.0\"?>\n"
                             "<p i=\"1\" j=\"\" k=\"  \"/>\n"
                             "<!-- one\n two -->\n"
                             "<q>text</q>\n"
+                            "<v a=\"1\"> two words </v>\n"
                             "<p i=\"2\">\n"
                             "<s>\n<![CDATA[ x ]]>\n</s>\n"
                             "<!DOCTYPE inner>\n"
@@ -170,6 +171,7 @@ TEST_F(PendingTest, XmlChildrenAreBuiltOnFirstUseAndWrittenAlike) {
                                  " <p i=\"1\" k=\"\"/>\n"
                                  "<!-- one\ntwo -->\n"
                                  " <q>text</q>\n"
+                                 " <v>two words</v>\n"
                                  " <p i=\"2\">\n"
                                  "  <s>\n"
                                  "<![CDATA[ x ]]>\n"
@@ -185,11 +187,11 @@ TEST_F(PendingTest, XmlChildrenAreBuiltOnFirstUseAndWrittenAlike) {
         auto file = readXml(kNested);
         OxXmlElement const* r = file->getRoot();
         ASSERT_NE(r, nullptr);
-        EXPECT_EQ(r->getNbChildElements(), 4u) << touched; // counted, the comment too
+        EXPECT_EQ(r->getNbChildElements(), 5u) << touched; // counted, the comment too
         if (touched == 1) { // the dump builds every node, the deepest too
             EXPECT_NE(oxtest::dumpText(*r).find("XML Element: \"t\""), std::string::npos);
         } else if (touched == 2) {
-            EXPECT_STREQ(r->getChild(3)->getChild(0)->getChild(0)->getValue(), "<![CDATA[ x ]]>");
+            EXPECT_STREQ(r->getChild(4)->getChild(0)->getChild(0)->getValue(), "<![CDATA[ x ]]>");
         }
         std::string out = dir.file("out" + std::to_string(touched) + ".xml");
         file->open(out.c_str(), OxFile::OxIOOutput);
@@ -200,9 +202,9 @@ TEST_F(PendingTest, XmlChildrenAreBuiltOnFirstUseAndWrittenAlike) {
     // Each node built once, with its parent, name, value and attributes.
     auto file = readXml(kNested);
     OxXmlElement* r = file->getRootForUpdate();
-    OxXmlElement* p2 = r->getChild(3);
+    OxXmlElement* p2 = r->getChild(4);
     ASSERT_NE(p2, nullptr);
-    EXPECT_EQ(r->getChild(3), p2);
+    EXPECT_EQ(r->getChild(4), p2);
     EXPECT_EQ(p2->getParent(), r);
     EXPECT_STREQ(p2->getAttributeValue("i"), "2");
     EXPECT_EQ(r->getChild(0)->getAttributeValue("j"), nullptr);
@@ -213,6 +215,10 @@ TEST_F(PendingTest, XmlChildrenAreBuiltOnFirstUseAndWrittenAlike) {
     EXPECT_STREQ(comment->getValue(), "<!-- one\ntwo -->"); // lines are trimmed
     EXPECT_EQ(comment->getParent(), r);
     EXPECT_STREQ(r->getChildByName("q")->getValue(), "text");
+    OxXmlElement* v = r->getChild(3); // a value on its line, attributes before it
+    EXPECT_STREQ(v->getValue(), "two words");
+    EXPECT_STREQ(v->getAttributeValue("a"), "1");
+    EXPECT_EQ(v->getNbChildElements(), 0u);
     ASSERT_EQ(p2->getNbChildElements(), 3u);
     EXPECT_EQ(p2->getChild(1)->getType(), OxXmlElement::XML_TYPE_DOCTYPE);
     EXPECT_EQ(p2->getChild(2)->getParent(), p2);
@@ -223,13 +229,23 @@ TEST_F(PendingTest, XmlChildrenAreBuiltOnFirstUseAndWrittenAlike) {
     auto other = readXml(kNested);
     OxXmlElement* top = other->getRootForUpdate();
     top->addChild(new OxXmlElement("w"));
-    ASSERT_EQ(top->getNbChildElements(), 5u);
-    EXPECT_STREQ(top->getChild(4)->getName(), "w");
+    ASSERT_EQ(top->getNbChildElements(), 6u);
+    EXPECT_STREQ(top->getChild(5)->getName(), "w");
     EXPECT_STREQ(top->getChild(2)->getName(), "q");
     auto deleted = readXml(kNested);
-    EXPECT_EQ(deleted->getRootForUpdate()->deleteChild(4), OxFalse);
+    EXPECT_EQ(deleted->getRootForUpdate()->deleteChild(5), OxFalse);
     EXPECT_EQ(deleted->getRootForUpdate()->deleteChildren("p"), OxTrue);
-    EXPECT_EQ(deleted->getRoot()->getNbChildElements(), 2u);
+    EXPECT_EQ(deleted->getRoot()->getNbChildElements(), 3u);
+    // Elements whose end tag stands right behind the start tag.
+    auto empty = readXml("<?xml version=\"1.0\"?>\n<r>\n<e x=\"1\"></e>\n<f> </f>\n</r>\n");
+    empty->open(dir.file("empty.xml").c_str(), OxFile::OxIOOutput);
+    ASSERT_EQ(empty->writeFile(), OxTrue);
+    EXPECT_EQ(oxtest::readText(dir.file("empty.xml")),
+              "<?xml version=\"1.0\"?>\n<r>\n <e x=\"1\"/>\n <f/>\n</r>\n");
+    ASSERT_EQ(empty->getRoot()->getNbChildElements(), 2u);
+    EXPECT_STREQ(empty->getRoot()->getChild(0)->getAttributeValue("x"), "1");
+    EXPECT_EQ(empty->getRoot()->getChild(1)->getValue(), nullptr);
+
     // Documents destroyed with their nodes never built (comment, CDATA and
     // DOCTYPE objects among them) leave nothing behind (the sanitizers tell).
     readXml(kNested);
@@ -270,6 +286,29 @@ TEST_F(PendingTest, CsvRecordsKeepTheirFieldsUntilAsked) {
     csv->open(dir.file("out.csv").c_str(), OxFile::OxIOOutput);
     ASSERT_EQ(csv->writeFile(), OxTrue);
     EXPECT_EQ(oxtest::readText(dir.file("out.csv")), "a,b,c\n1,,x,y,4\n,,,\n2,,\n");
+}
+
+TEST_F(PendingTest, CsvRecordsOfManyBlocksComeBackInOrder) {
+    // Short lines, far more than one slab of the store holds: the records
+    // are counted and built in order across the blocks they were kept in.
+    std::string table = "a,b\n";
+    for (int i = 0; i < 30000; i++) {
+        table += i % 7 == 3 ? ",\n" : std::to_string(i) + "," + std::to_string(2 * i) + "\n";
+    }
+    auto csv = readCsv(table);
+    const OxXmlElement* root = csv->getRoot();
+    ASSERT_EQ(root->getNbChildElements(), 30000u);
+    for (unsigned int i : {0u, 3u, 9999u, 17000u, 29999u}) {
+        OxXmlElement const* record = root->getChild(i);
+        ASSERT_NE(record, nullptr) << i;
+        EXPECT_EQ(record->getParent(), root) << i;
+        if (i % 7 == 3) {
+            EXPECT_EQ(record->getNbAttributes(), 0u) << i;
+            continue;
+        }
+        EXPECT_EQ(record->getNbAttributes(), 2u) << i;
+        EXPECT_EQ(std::string(record->getAttributeValue("b")), std::to_string(2 * i)) << i;
+    }
 }
 
 TEST_F(PendingTest, CsvDumpOfPendingAndBuiltRecordsAgrees) {

@@ -32,36 +32,22 @@ void OxCsvRecords::cover(unsigned int positions) {
 }
 
 void OxCsvRecords::take(char const* line, std::size_t length) {
-    // Count the non-empty fields and find the last one's position: the
-    // columns must name it before any record refers to it.
+    // The columns must name the last non-empty field before any record
+    // refers to it.
     unsigned int count = 0;
-    unsigned int position = 0;
     unsigned int covered = 0;
-    std::size_t fieldLength = 0;
-    for (std::size_t i = 0; i < length; i++) {
-        if (line[i] != separator) {
-            fieldLength++;
-            continue;
-        }
-        if (fieldLength != 0) {
-            count++;
-            covered = position + 1;
-        }
-        fieldLength = 0;
-        position++;
-    }
-    if (fieldLength != 0) {
-        count++;
-        covered = position + 1;
-    }
+    countCsvFields(line, length, separator, count, covered);
     cover(covered);
-    OxXmlRecord* record = store.newCsv(shape, count, line, length);
-    if (last == nullptr) {
-        root.firstChild = record;
-    } else {
-        last->next = record;
+    if (last != nullptr && store.addCsvLine(last, line, length)) {
+        return;
     }
-    last = record;
+    OxXmlCsvBlock* block = store.newCsvBlock(shape, line, length);
+    if (last == nullptr) {
+        root.first = block;
+    } else {
+        last->next = block;
+    }
+    last = block;
 }
 
 } // namespace detail

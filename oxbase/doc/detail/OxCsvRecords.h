@@ -2,10 +2,10 @@
 //
 // Each data line becomes an element "record" under the root, with one
 // attribute per non-empty field named after its column. A record is left in
-// the store (OxXmlStore) as its trimmed line and its count of non-empty
-// fields (OxXmlCsvRecord), linked behind the one before: the elements and
-// their attributes are built only when a caller asks for them, so that
-// reading a line costs a scan and a copy. Each column's name is looked up
+// the store (OxXmlStore) as its trimmed line, in blocks of consecutive
+// lines (OxXmlCsvBlock): the elements and their attributes are built only
+// when a caller asks for them, so that reading a line costs a scan and a
+// copy. Each column's name is looked up
 // once per read.
 //
 //   OxCsvRecords records(store, *rootRecord, columnNames, ',');
@@ -46,7 +46,7 @@ private:
 
     OxXmlStore& store;
     OxXmlTagRecord& root;
-    OxXmlRecord* last = nullptr; ///< the last record so far
+    OxXmlCsvBlock* last = nullptr; ///< the last block so far
     OxGList<char*> const& header;
     OxCsvColumns* columns = nullptr;
     char separator;

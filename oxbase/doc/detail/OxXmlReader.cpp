@@ -257,7 +257,7 @@ int OxXmlReader::doContent() {
     createElement(open, nameBegin, nameEnd, true);
     cursor = nameEnd + 1;
     if (*nameEnd == '>') {
-        commitTag(); // no attributes
+        commitStartTag(nameEnd); // no attributes
         state = ELEMENT_VALUE;
         return kGoOn;
     }
@@ -276,9 +276,10 @@ int OxXmlReader::doElementValue() {
     }
     char* open = find(cursor, '<');
     char* valueEnd = open != nullptr ? open : lineEnd;
-    if (current != nullptr) {
+    if (current != nullptr && current->shape->kind == OxXmlShape::kTag) {
+        // (A valued tag got this value with its record.)
         char* text = store.copyValue(cursor, static_cast<size_t>(valueEnd - cursor));
-        current->value = text;
+        static_cast<OxXmlTagRecord*>(current)->text = text;
         if (OxXmlElement* element = frames.data[frames.length - 1].element) {
             element->value = text; // kStoredValue since fromRecord
         }
@@ -321,11 +322,8 @@ int OxXmlReader::doAttribute() {
             if (p[1] != '>') {
                 return OxMsgXmlBadTagEnd;
             }
-            commitTag();
-            if (current != nullptr) {
-                closeCurrent();
-            }
-            cursor = p + 2; // CONTENT would skip the ">" as text
+            commitTag(true); // an empty element tag: a leaf, never opened
+            cursor = p + 2;  // CONTENT would skip the ">" as text
             state = CONTENT;
             return kGoOn;
         case '=': {
@@ -340,7 +338,7 @@ int OxXmlReader::doAttribute() {
             continue;
         }
         case '>':
-            commitTag();
+            commitStartTag(p);
             cursor = p + 1;
             state = ELEMENT_VALUE;
             return kGoOn;
@@ -486,10 +484,9 @@ int OxXmlReader::doDoctype() {
 }
 
 void OxXmlReader::createElement(char* tagStart, char* nameBegin, char* nameEnd, bool makeCurrent) {
-    commitTag();
+    commitTag(false);
     tagName = names.lookup(nameBegin, static_cast<size_t>(nameEnd - nameBegin));
     tagOpen = true;
-    tagMakeCurrent = makeCurrent;
     if (current == nullptr && file.root != nullptr) {
         // A second element at top level has no parent to go to: it is
         // kept behind the root, where the writer writes it back.
@@ -497,17 +494,51 @@ void OxXmlReader::createElement(char* tagStart, char* nameBegin, char* nameEnd, 
                    nameOrEmpty(tagName));
     }
     if (!makeCurrent) {
-        commitTag(); // an empty element tag has no attributes
+        commitTag(true); // an empty element tag without attributes
     }
 }
 
-void OxXmlReader::commitTag() {
+void OxXmlReader::commitStartTag(char* close) {
+    // What doElementValue will find behind the ">" on this line.
+    char* p = close + 1;
+    while (p < lineEnd && *p == ' ') {
+        p++;
+    }
+    if (p < lineEnd && *p == '<') {
+        char* q = p + 1;
+        while (q < lineEnd && *q == ' ') {
+            q++;
+        }
+        // An end tag right behind: no value, no children, but it is the end
+        // tag that closes the element (and tells a name that differs).
+        commitTag(*q == '/' ? OxXmlShape::kLeaf : OxXmlShape::kTag, nullptr, 0, true);
+        return;
+    }
+    if (p == lineEnd) {
+        commitTag(OxXmlShape::kTag);
+        return;
+    }
+    char* open = find(p, '<');
+    char* valueEnd = open != nullptr ? open : lineEnd;
+    commitTag(OxXmlShape::kValued, p, static_cast<size_t>(valueEnd - p));
+}
+
+void OxXmlReader::commitTag(OxXmlShape::Kind kind, char const* value, size_t valueLength,
+                            bool open) {
     endAttribute();
     if (!tagOpen) {
         return;
     }
-    OxXmlShape const* shape = store.tagShape(tagName, tagNames.data, tagNames.length);
-    OxXmlTagRecord* record = store.newTag(shape, tagValues.text(), tagValues.size());
+    if (kind == OxXmlShape::kValued) {
+        // Trimmed as setValue trims: white space alone is an empty text.
+        char const* first = value;
+        char const* last = value + valueLength;
+        OxXmlNames::trim(first, last);
+        tagValues.append(first, static_cast<size_t>(last - first));
+        tagValues.append('\0');
+    }
+    OxXmlShape const* shape = store.tagShape(tagName, tagNames.data, tagNames.length, kind);
+    OxXmlRecord* record = store.newTag(shape, tagValues.text(), tagValues.size());
     tagOpen = false;
     tagNames.length = 0;
     tagValues.clear();
@@ -527,7 +558,7 @@ void OxXmlReader::commitTag() {
             }
         }
     }
-    if (tagMakeCurrent) {
+    if (open || kind != OxXmlShape::kLeaf) {
         frames.append(Frame{record, nullptr, element});
         current = record;
     }
@@ -536,7 +567,10 @@ void OxXmlReader::commitTag() {
 void OxXmlReader::link(OxXmlRecord* record) {
     Frame& frame = frames.data[frames.length - 1];
     if (frame.last == nullptr) {
-        frame.record->firstChild = record;
+        // Only a start tag (kTag) gets children: a valued tag or an opened
+        // leaf is closed by the end tag behind it before anything else is
+        // read.
+        static_cast<OxXmlTagRecord*>(frame.record)->first = record;
     } else {
         frame.last->next = record;
     }
@@ -595,7 +629,7 @@ void OxXmlReader::finish() {
     if (gathering && gatheredValid) {
         setAttributeValue(gathered.text(), gathered.size());
     }
-    commitTag();
+    commitTag(false); // a tag the input left open stays open
     if (commentOpen[0]) {
         finishComment(false);
     }

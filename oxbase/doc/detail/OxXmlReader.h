@@ -137,17 +137,25 @@ private:
     }
     /// Opens the tag named [nameBegin, nameEnd): its record is made when its
     /// attributes are known (commitTag), at once for an empty element tag
-    /// (`makeCurrent` false).
+    /// without attributes (`makeCurrent` false).
     void createElement(char* tagStart, char* nameBegin, char* nameEnd, bool makeCurrent);
     void closeByEndTag(char* tagStart, char* nameBegin);
     /// Places `node`, a comment, CDATA or DOCTYPE object: in the current
     /// element (the store owns it then), else beside the root. Without
     /// memory std::bad_alloc, and the caller still owns it.
     void attach(OxXmlElement* node);
-    /// Makes the record of the tag in progress, links it into the current
-    /// element or places its element at top level, and opens it when the
-    /// tag was a start tag.
-    void commitTag();
+    /// Makes the record of the tag in progress, an empty element tag when
+    /// `leaf`, links it into the current element or places its element at
+    /// top level, and opens it unless it is a leaf.
+    void commitTag(bool leaf) { commitTag(leaf ? OxXmlShape::kLeaf : OxXmlShape::kTag); }
+    /// The same for a start tag whose ">" is at `close`: a valued tag when
+    /// its value stands behind it on this line (doElementValue reads it
+    /// there and the end tag must follow), with that value in its record; a
+    /// leaf, opened, when its end tag stands right behind it.
+    void commitStartTag(char* close);
+    /// `open`: a leaf that its end tag closes.
+    void commitTag(OxXmlShape::Kind kind, char const* value = nullptr, size_t valueLength = 0,
+                   bool open = false);
     /// Links `record` behind the last child of the current element.
     void link(OxXmlRecord* record);
     /// Closes the current element; its parent becomes the current one.
@@ -194,12 +202,12 @@ private:
     // child so far, and for one at top level its element (which gets the
     // value too).
     struct Frame {
-        OxXmlTagRecord* record;
+        OxXmlRecord* record;
         OxXmlRecord* last;
         OxXmlElement* element;
     };
     OxGList<Frame> frames;
-    OxXmlTagRecord* current = nullptr;
+    OxXmlRecord* current = nullptr;
     // Comment and CDATA in progress: the node and its text so far.
     bool commentOpen[2] = {false, false};
     OxXmlElement* commentNode[2] = {nullptr, nullptr};
@@ -207,11 +215,9 @@ private:
     // The DOCTYPE text: gathered over the whole read, stored at its end.
     bool doctypeLoaded = false;
     OxXmlTextBuffer doctypeText;
-    // The tag in progress: its name, whether it is a start tag, and its
-    // attributes (their names, and their values laid out as its record
-    // keeps them).
+    // The tag in progress: its name and its attributes (their names, and
+    // their values laid out as its record keeps them).
     bool tagOpen = false;
-    bool tagMakeCurrent = false;
     char const* tagName = nullptr;
     OxGList<char const*> tagNames;
     OxXmlTextBuffer tagValues;

@@ -9,10 +9,11 @@
 //   - a tag (kTag): its sibling and first child, its value text, its shape
 //     (the element name and the attribute names, shared by every tag that
 //     has the same ones) and the attribute values behind it, each
-//     NUL-terminated;
-//   - a CSV record (kCsv): its sibling, its shape (the name "record" and
-//     the column names of its read), its count of non-empty fields and its
-//     trimmed line;
+//     NUL-terminated; an empty element tag (kLeaf) without the first child
+//     and the value, which it cannot have;
+//   - CSV records (kCsv): blocks of the trimmed lines of consecutive
+//     records, with the shape of their read (the name "record" and the
+//     column names);
 //   - any other node (kNode): a comment, CDATA or DOCTYPE node inside an
 //     element, an OxXmlElement object of its own that the store owns until
 //     its parent's children are built.
@@ -58,14 +59,20 @@ struct OxCsvColumns {
 /// array of `count` shared names behind the shape), for CSV records the
 /// columns. Every name is held by the store.
 struct OxXmlShape {
-    enum Kind : std::uint8_t { kTag, kCsv, kNode };
+    /// kTag a start tag, kLeaf an empty element tag ("/>", no value and no
+    /// children: a record without the room for them), kValued a start tag
+    /// whose value stands behind it on its line (the value must end there
+    /// with the end tag: no children, and the value behind the attribute
+    /// values), kCsv a CSV record, kNode any other node.
+    enum Kind : std::uint8_t { kTag, kLeaf, kValued, kCsv, kNode };
 
     char const* name;
     OxCsvColumns const* columns; ///< kCsv
     OxXmlStore* store;           ///< where the records and their nodes live
-    std::uint32_t count;         ///< kTag: attributes of every tag of the shape
+    std::uint32_t count;         ///< kTag, kLeaf: attributes of every tag of the shape
     Kind kind;
 
+    bool isTag() const { return kind == kTag || kind == kLeaf || kind == kValued; }
     char const** names() { return reinterpret_cast<char const**>(this + 1); }
     char const* const* names() const { return reinterpret_cast<char const* const*>(this + 1); }
     static std::size_t bytes(unsigned int count) {
@@ -77,22 +84,22 @@ static_assert(sizeof(OxXmlShape) % alignof(char const*) == 0,
               "the attribute names follow the shape aligned");
 
 /// The head of every record: the next sibling (null for the last) and the
-/// shape. What follows depends on the shape's kind.
+/// shape. What follows depends on the shape's kind: a leaf has its
+/// attribute values right behind the head, `shape->count` texts, each
+/// NUL-terminated, a value that is no text (an attribute without value)
+/// written as a single blank, which no trimmed value can be; a valued tag
+/// has its own value behind them, NUL-terminated too.
 struct OxXmlRecord {
     OxXmlRecord* next;
     OxXmlShape const* shape;
-};
 
-/// A tag. Its attribute values follow it: `shape->count` texts, each
-/// NUL-terminated, a value that is no text (an attribute without value)
-/// written as a single blank, which no trimmed value can be.
-struct OxXmlTagRecord : OxXmlRecord {
-    OxXmlRecord* firstChild; ///< null without children
-    char* value;             ///< a text of the store, or null
-
-    char* values() { return reinterpret_cast<char*>(this + 1); }
-    /// Calls `take(name, value)` for each attribute in list order.
-    template <class Take> void forEachAttribute(Take take) {
+    /// For tags: the first child and the value (null when there is none).
+    inline OxXmlRecord* firstChild();
+    inline char* value();
+    /// For tags: where the attribute values begin.
+    inline char* values();
+    /// For tags: calls `take(name, value)` for each attribute in list order.
+    template <class Take> void forEachTagAttribute(Take take) {
         char const* const* names = shape->names();
         char* text = values();
         for (std::uint32_t i = 0; i < shape->count; i++) {
@@ -103,11 +110,54 @@ struct OxXmlTagRecord : OxXmlRecord {
     }
 };
 
-/// A CSV record. Its trimmed line follows it, NUL-terminated.
+/// A start tag: the head, the first child and the value, then the
+/// attribute values as a leaf has them.
+struct OxXmlTagRecord : OxXmlRecord {
+    OxXmlRecord* first; ///< null without children
+    char* text;         ///< the value, a text of the store, or null
+};
+
+OxXmlRecord* OxXmlRecord::firstChild() {
+    return shape->kind == OxXmlShape::kTag ? static_cast<OxXmlTagRecord*>(this)->first : nullptr;
+}
+
+char* OxXmlRecord::value() {
+    if (shape->kind == OxXmlShape::kTag) {
+        return static_cast<OxXmlTagRecord*>(this)->text;
+    }
+    if (shape->kind != OxXmlShape::kValued) {
+        return nullptr;
+    }
+    char* text = values();
+    for (std::uint32_t i = 0; i < shape->count; i++) {
+        text += std::strlen(text) + 1;
+    }
+    return text;
+}
+
+char* OxXmlRecord::values() {
+    return shape->kind == OxXmlShape::kTag
+               ? reinterpret_cast<char*>(static_cast<OxXmlTagRecord*>(this) + 1)
+               : reinterpret_cast<char*>(this + 1);
+}
+
+/// The records of consecutive CSV lines as the reader leaves them: their
+/// trimmed lines one behind the other, each NUL-terminated, behind the head
+/// (a few bytes of head per block, none per line).
+struct OxXmlCsvBlock : OxXmlRecord {
+    std::uint32_t lines;
+    std::size_t bytes; ///< of the lines, their NULs included
+
+    char* text() { return reinterpret_cast<char*>(this + 1); }
+};
+
+/// One CSV record as its element refers to it, made when the element is
+/// built: its count of non-empty fields and its line in a block.
 struct OxXmlCsvRecord : OxXmlRecord {
     std::uint32_t count; ///< non-empty fields
+    char* text;
 
-    char* line() { return reinterpret_cast<char*>(this + 1); }
+    char* line() { return text; }
     /// Calls `take(name, value)` for each non-empty field in list order. The
     /// fields are trimmed in place and their ends written into the line on
     /// the way, so this runs once per record, and `take` must not fail.
@@ -126,6 +176,7 @@ struct OxXmlNodeRecord : OxXmlRecord {
 /// NUL included (the whole line is then one field). `take` may write a NUL
 /// over the separator that ends its field.
 template <class Take> void splitCsvFields(char* line, char separator, Take take) {
+    // (The line is NUL-terminated: see countCsvFields for a counted one.)
     char* start = line;
     for (char* p = line;; p++) {
         bool last = *p == '\0';
@@ -137,6 +188,33 @@ template <class Take> void splitCsvFields(char* line, char separator, Take take)
             return;
         }
         start = p + 1;
+    }
+}
+
+/// Counts the non-empty fields of the `length` characters at `line` (the
+/// fields as splitCsvFields finds them) into `count`, and gives in `covered`
+/// the position behind the last of them (0 without any).
+inline void countCsvFields(char const* line, std::size_t length, char separator,
+                           unsigned int& count, unsigned int& covered) {
+    count = 0;
+    covered = 0;
+    unsigned int position = 0;
+    std::size_t fieldLength = 0;
+    for (std::size_t i = 0; i < length; i++) {
+        if (line[i] != separator) {
+            fieldLength++;
+            continue;
+        }
+        if (fieldLength != 0) {
+            count++;
+            covered = position + 1;
+        }
+        fieldLength = 0;
+        position++;
+    }
+    if (fieldLength != 0) {
+        count++;
+        covered = position + 1;
     }
 }
 

@@ -117,16 +117,28 @@ std::size_t mixPointer(std::size_t hash, void const* pointer) {
     auto bits = static_cast<std::uint64_t>(reinterpret_cast<std::uintptr_t>(pointer));
     return static_cast<std::size_t>((hash ^ bits) * 0x9E3779B97F4A7C15ULL);
 }
+
+/// The hash of a tag shape: its names (the shared texts, by address).
+std::size_t shapeHash(char const* name, char const* const* attributeNames, unsigned int count) {
+    std::size_t hash = mixPointer(0, name);
+    for (unsigned int n = 0; n < count; n++) {
+        hash = mixPointer(hash, attributeNames[n]);
+    }
+    return hash;
+}
 } // namespace
 
 OxXmlShape** OxXmlStore::findShape(char const* name, char const* const* attributeNames,
-                                   unsigned int count, std::size_t hash) {
+                                   unsigned int count, OxXmlShape::Kind kind, std::size_t hash) {
     std::size_t mask = shapeSlots - 1;
     for (std::size_t slot = (hash >> 20) & mask;; slot = (slot + 1) & mask) {
         OxXmlShape* shape = shapes[slot];
-        if (shape == nullptr || (shape->name == name && shape->count == count &&
-                                 (count == 0 || std::memcmp(shape->names(), attributeNames,
-                                                            count * sizeof(char const*)) == 0))) {
+        if (shape == nullptr) {
+            return &shapes[slot];
+        }
+        if (shape->name == name && shape->count == count && shape->kind == kind &&
+            (count == 0 ||
+             std::memcmp(shape->names(), attributeNames, count * sizeof(char const*)) == 0)) {
             return &shapes[slot];
         }
     }
@@ -142,29 +154,23 @@ void OxXmlStore::growShapes() {
     for (std::size_t i = 0; i < oldSlots; i++) {
         OxXmlShape* shape = old[i];
         if (shape != nullptr) {
-            std::size_t hash = mixPointer(0, shape->name);
-            for (std::uint32_t n = 0; n < shape->count; n++) {
-                hash = mixPointer(hash, shape->names()[n]);
-            }
-            *findShape(shape->name, shape->names(), shape->count, hash) = shape;
+            *findShape(shape->name, shape->names(), shape->count, shape->kind,
+                       shapeHash(shape->name, shape->names(), shape->count)) = shape;
         }
     }
     delete[] old;
 }
 
 OxXmlShape const* OxXmlStore::tagShape(char const* name, char const* const* attributeNames,
-                                       unsigned int count) {
+                                       unsigned int count, OxXmlShape::Kind kind) {
     if ((shapeCount + 1) * 2 > shapeSlots) {
         growShapes();
     }
-    std::size_t hash = mixPointer(0, name);
-    for (unsigned int n = 0; n < count; n++) {
-        hash = mixPointer(hash, attributeNames[n]);
-    }
-    OxXmlShape** slot = findShape(name, attributeNames, count, hash);
+    OxXmlShape** slot =
+        findShape(name, attributeNames, count, kind, shapeHash(name, attributeNames, count));
     if (*slot == nullptr) {
-        auto* shape = ::new (allocate(OxXmlShape::bytes(count)))
-            OxXmlShape{name, nullptr, this, count, OxXmlShape::kTag};
+        auto* shape =
+            ::new (allocate(OxXmlShape::bytes(count))) OxXmlShape{name, nullptr, this, count, kind};
         if (count > 0) {
             std::memcpy(static_cast<void*>(shape->names()), attributeNames,
                         count * sizeof(char const*));
@@ -180,29 +186,57 @@ OxXmlShape const* OxXmlStore::csvShape(char const* name, OxCsvColumns const* col
         OxXmlShape{name, columns, this, 0, OxXmlShape::kCsv};
 }
 
-OxXmlTagRecord* OxXmlStore::newTag(OxXmlShape const* shape, char const* values,
-                                   std::size_t length) {
-    void* memory = allocate(sizeof(OxXmlTagRecord) + length);
-    auto* tag = ::new (memory) OxXmlTagRecord;
-    tag->next = nullptr;
-    tag->shape = shape;
-    tag->firstChild = nullptr;
-    tag->value = nullptr;
-    if (length > 0) {
-        std::memcpy(tag->values(), values, length);
+OxXmlRecord* OxXmlStore::newTag(OxXmlShape const* shape, char const* values, std::size_t length) {
+    OxXmlRecord* record = nullptr;
+    if (shape->kind != OxXmlShape::kTag) {
+        record = ::new (allocate(sizeof(OxXmlRecord) + length)) OxXmlRecord;
+    } else {
+        auto* tag = ::new (allocate(sizeof(OxXmlTagRecord) + length)) OxXmlTagRecord;
+        tag->first = nullptr;
+        tag->text = nullptr;
+        record = tag;
     }
-    return tag;
+    record->next = nullptr;
+    record->shape = shape;
+    if (length > 0) {
+        std::memcpy(record->values(), values, length);
+    }
+    return record;
 }
 
-OxXmlCsvRecord* OxXmlStore::newCsv(OxXmlShape const* shape, unsigned int count, char const* line,
-                                   std::size_t length) {
-    void* memory = allocate(sizeof(OxXmlCsvRecord) + length + 1);
+OxXmlCsvBlock* OxXmlStore::newCsvBlock(OxXmlShape const* shape, char const* line,
+                                       std::size_t length) {
+    void* memory = allocate(sizeof(OxXmlCsvBlock) + length + 1);
+    auto* block = ::new (memory) OxXmlCsvBlock;
+    block->next = nullptr;
+    block->shape = shape;
+    block->lines = 1;
+    block->bytes = length + 1;
+    std::memcpy(block->text(), line, length);
+    block->text()[length] = '\0';
+    return block;
+}
+
+bool OxXmlStore::addCsvLine(OxXmlCsvBlock* block, char const* line, std::size_t length) {
+    if (block->text() + block->bytes != cursor ||
+        static_cast<std::size_t>(end - cursor) <= length || block->lines == UINT32_MAX) {
+        return false;
+    }
+    std::memcpy(cursor, line, length);
+    cursor[length] = '\0';
+    cursor += length + 1;
+    block->bytes += length + 1;
+    block->lines++;
+    return true;
+}
+
+OxXmlCsvRecord* OxXmlStore::newCsvRecord(OxXmlShape const* shape, unsigned int count, char* text) {
+    void* memory = allocateIn(sizeof(OxXmlCsvRecord), nodeCursor, nodeEnd);
     auto* record = ::new (memory) OxXmlCsvRecord;
     record->next = nullptr;
     record->shape = shape;
     record->count = count;
-    std::memcpy(record->line(), line, length);
-    record->line()[length] = '\0';
+    record->text = text;
     return record;
 }
 

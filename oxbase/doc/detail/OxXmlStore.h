@@ -11,8 +11,8 @@
 // back to the heap at once when the document goes.
 //
 //   OxXmlStore store;
-//   OxXmlShape const* shape = store.tagShape(name, names, 2);
-//   OxXmlTagRecord* tag = store.newTag(shape, "1\0" "2\0", 4);
+//   OxXmlShape const* shape = store.tagShape(name, names, 2, OxXmlShape::kLeaf);
+//   OxXmlRecord* tag = store.newTag(shape, "1\0" "2\0", 4);
 //   // ... the tree is destroyed, then the store
 //
 // Nothing of this is visible to callers: the elements built from records
@@ -48,20 +48,27 @@ public:
     /// records must be gone before.
     ~OxXmlStore();
 
-    /// The shape of the tags named `name` (held here, or null) with the
-    /// `count` attributes named `names` (held here), in this order: the same
-    /// object for every tag alike.
-    OxXmlShape const* tagShape(char const* name, char const* const* names, unsigned int count);
+    /// The shape of the tags of `kind` (kTag, kLeaf or kValued) named `name`
+    /// (held here, or null) with the `count` attributes named `names` (held
+    /// here), in this order: the same object for every tag alike.
+    OxXmlShape const* tagShape(char const* name, char const* const* names, unsigned int count,
+                               OxXmlShape::Kind kind);
     /// A shape for the records of one CSV read, named `name` (held here).
     OxXmlShape const* csvShape(char const* name, OxCsvColumns const* columns);
-    /// A tag of `shape`, without sibling, children or value, followed by the
-    /// `length` bytes at `values` (the attribute values as OxXmlTagRecord
-    /// lays them out).
-    OxXmlTagRecord* newTag(OxXmlShape const* shape, char const* values, std::size_t length);
-    /// A CSV record of `shape` with `count` non-empty fields and the
-    /// `length` characters at `line`.
-    OxXmlCsvRecord* newCsv(OxXmlShape const* shape, unsigned int count, char const* line,
-                           std::size_t length);
+    /// A tag of `shape`, without sibling, children or value (but for a valued
+    /// tag's), followed by the `length` bytes at `values` (the attribute
+    /// values and a valued tag's value as OxXmlRecord lays them out).
+    OxXmlRecord* newTag(OxXmlShape const* shape, char const* values, std::size_t length);
+    /// A block of CSV records of `shape` holding the record of the `length`
+    /// characters at `line`.
+    OxXmlCsvBlock* newCsvBlock(OxXmlShape const* shape, char const* line, std::size_t length);
+    /// Adds the record of the `length` characters at `line` to `block`, the
+    /// last thing made here: false, and nothing changed, when the slab it
+    /// is in has no room left (a new block takes it then).
+    bool addCsvLine(OxXmlCsvBlock* block, char const* line, std::size_t length);
+    /// The record of one line `text` of a block, with `count` non-empty
+    /// fields, made in the area of the built elements.
+    OxXmlCsvRecord* newCsvRecord(OxXmlShape const* shape, unsigned int count, char* text);
     /// A kNode record of `node`, which the store owns from then on (and the
     /// caller still when this fails).
     OxXmlNodeRecord* newNode(OxXmlElement* node);
@@ -116,7 +123,7 @@ private:
     /// The slot of `shapes` for the shape (name, names, count): the one that
     /// holds it or the empty one where it goes.
     OxXmlShape** findShape(char const* name, char const* const* names, unsigned int count,
-                           std::size_t hash);
+                           OxXmlShape::Kind kind, std::size_t hash);
     /// Doubles the table of shapes.
     void growShapes();
 
