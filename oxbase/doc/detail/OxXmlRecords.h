@@ -10,7 +10,8 @@
 //     (the element name and the attribute names, shared by every tag that
 //     has the same ones) and the attribute values behind it, each
 //     NUL-terminated; an empty element tag (kLeaf) without the first child
-//     and the value, which it cannot have;
+//     and the value, which it cannot have, and a tag whose value ends on
+//     its line (kValued) with that value behind its attribute values;
 //   - CSV records (kCsv): blocks of the trimmed lines of consecutive
 //     records, with the shape of their read (the name "record" and the
 //     column names);
@@ -69,7 +70,7 @@ struct OxXmlShape {
     char const* name;
     OxCsvColumns const* columns; ///< kCsv
     OxXmlStore* store;           ///< where the records and their nodes live
-    std::uint32_t count;         ///< kTag, kLeaf: attributes of every tag of the shape
+    std::uint32_t count;         ///< tags: attributes of every tag of the shape
     Kind kind;
 
     bool isTag() const { return kind == kTag || kind == kLeaf || kind == kValued; }
