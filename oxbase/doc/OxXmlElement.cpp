@@ -1,17 +1,13 @@
 #include "oxbase/doc/OxXmlElement.h"
 
 #include "oxbase/core/OxString.h"
-#include "oxbase/core/OxSystem.h"
 #include "oxbase/core/detail/OxSlabPool.h"
 #include "oxbase/diag/OxPrt.h"
 #include "oxbase/doc/OxXmlFile.h"
 #include "oxbase/doc/detail/OxXmlNames.h"
 #include "oxbase/doc/detail/OxXmlRecords.h"
 #include "oxbase/doc/detail/OxXmlStore.h"
-#include "oxbase/geom/OxColor.h"
-#include "oxbase/geom/OxVec.h"
 
-#include <cstdlib>
 #include <cstring>
 #include <new>
 #include <typeinfo>
@@ -58,9 +54,6 @@ template <class T> void deleteList(OxGList<T>* list) {
         listPool.release(list);
     }
 }
-
-/// The delimiters of the number lists: blank and tab, not the line end.
-char const* const kNumberDelimiters = " \t";
 
 } // namespace
 
@@ -508,104 +501,6 @@ void OxXmlElement::setXsiType(char const* newType) {
     xsiType = copy;
 }
 
-int OxXmlElement::readNumbers(char const* attributeName, double* numbers,
-                              unsigned int count) const {
-    char const* text = getAttributeValue(attributeName);
-    if (text == nullptr) {
-        return 0;
-    }
-    char* copy = OxString::dup(text);
-    if (copy == nullptr) {
-        return -1;
-    }
-    unsigned int found = 0;
-    for (char* token = OxSystem::OxStrtok(copy, kNumberDelimiters);
-         token != nullptr && found < count;
-         token = OxSystem::OxStrtok(nullptr, kNumberDelimiters)) {
-        numbers[found++] = std::atof(OxString::stripWhite(token));
-    }
-    delete[] copy;
-    return found == count ? 1 : -1;
-}
-
-OxBool OxXmlElement::getIndices(OxGList<unsigned int>* indices) const {
-    if (indices == nullptr) {
-        return OxTrue;
-    }
-    char const* text = getAttributeValue(OxXmlFile::OX_XML_FIELD_INDICES);
-    if (text == nullptr) {
-        return OxTrue;
-    }
-    char* copy = OxString::stripWhite(OxString::dup(text));
-    if (copy == nullptr) {
-        return OxFalse;
-    }
-    unsigned int found = 0;
-    for (char* token = OxSystem::OxStrtok(copy, kNumberDelimiters); token != nullptr;
-         token = OxSystem::OxStrtok(nullptr, kNumberDelimiters)) {
-        indices->append(static_cast<unsigned int>(std::atol(OxString::stripWhite(token))));
-        found++;
-    }
-    delete[] copy;
-    return OxToBool(found > 0);
-}
-
-OxBool OxXmlElement::getColor(OxColor& color) const {
-    double rgb[3];
-    int result = readNumbers(OxXmlFile::OX_XML_FIELD_COLOR, rgb, 3);
-    if (result > 0) {
-        color.setColor(rgb[0], rgb[1], rgb[2]);
-    }
-    return OxToBool(result >= 0);
-}
-
-OxBool OxXmlElement::getPoint(OxVec2d& point) const {
-    return getPoint(OxXmlFile::OX_XML_FIELD_VEC2D, point);
-}
-
-OxBool OxXmlElement::getPoint(OxVec3d& point) const {
-    return getPoint(OxXmlFile::OX_XML_FIELD_VEC3D, point);
-}
-
-OxBool OxXmlElement::getPoint(OxVec4d& point) const {
-    return getPoint(OxXmlFile::OX_XML_FIELD_VEC4D, point);
-}
-
-OxBool OxXmlElement::getPoint(char const* attributeName, OxVec2d& point) const {
-    if (attributeName == nullptr) {
-        return OxFalse;
-    }
-    double xy[2];
-    int result = readNumbers(attributeName, xy, 2);
-    if (result > 0) {
-        point.setValue(xy[0], xy[1]);
-    }
-    return OxToBool(result >= 0);
-}
-
-OxBool OxXmlElement::getPoint(char const* attributeName, OxVec3d& point) const {
-    if (attributeName == nullptr) {
-        return OxFalse;
-    }
-    double xyz[3];
-    int result = readNumbers(attributeName, xyz, 3);
-    if (result > 0) {
-        point.setValue(xyz[0], xyz[1], xyz[2]);
-    }
-    return OxToBool(result >= 0);
-}
-
-OxBool OxXmlElement::getPoint(char const* attributeName, OxVec4d& point) const {
-    if (attributeName == nullptr) {
-        return OxFalse;
-    }
-    double xyzw[4];
-    int result = readNumbers(attributeName, xyzw, 4);
-    if (result > 0) {
-        point.setValue(xyzw[0], xyzw[1], xyzw[2], xyzw[3]);
-    }
-    return OxToBool(result >= 0);
-}
 void OxXmlElement::dumpNode(std::ostrstream& stream) const {
     // Pending attributes are built before anything is written: without
     // memory the stream gets no part of the node.
