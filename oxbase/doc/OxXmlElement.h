@@ -223,6 +223,10 @@ private:
     /// Reads up to `count` numbers of attribute `attributeName` into `numbers`.
     /// 1: all found; 0: attribute or value missing; -1: too few or no copy.
     int readNumbers(char const* attributeName, double* numbers, unsigned int count) const;
+    /// The `count` coordinates of `point` from attribute `attributeName`, as
+    /// the named getPoint reads them (defined where they are instantiated).
+    template <class Point>
+    OxBool readPoint(char const* attributeName, Point& point, unsigned int count) const;
     /// Writes the node's own lines and attributes (not the children).
     void dumpNode(std::ostrstream& stream) const;
 

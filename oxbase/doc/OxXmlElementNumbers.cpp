@@ -77,38 +77,29 @@ OxBool OxXmlElement::getPoint(OxVec4d& point) const {
     return getPoint(OxXmlFile::OX_XML_FIELD_VEC4D, point);
 }
 
-OxBool OxXmlElement::getPoint(char const* attributeName, OxVec2d& point) const {
+template <class Point>
+OxBool OxXmlElement::readPoint(char const* attributeName, Point& point, unsigned int count) const {
     if (attributeName == nullptr) {
         return OxFalse;
     }
-    double xy[2];
-    int result = readNumbers(attributeName, xy, 2);
+    double numbers[4];
+    int result = readNumbers(attributeName, numbers, count);
     if (result > 0) {
-        point.setValue(xy[0], xy[1]);
+        for (unsigned int i = 0; i < count; i++) {
+            point[static_cast<int>(i)] = numbers[i];
+        }
     }
     return OxToBool(result >= 0);
+}
+
+OxBool OxXmlElement::getPoint(char const* attributeName, OxVec2d& point) const {
+    return readPoint(attributeName, point, 2);
 }
 
 OxBool OxXmlElement::getPoint(char const* attributeName, OxVec3d& point) const {
-    if (attributeName == nullptr) {
-        return OxFalse;
-    }
-    double xyz[3];
-    int result = readNumbers(attributeName, xyz, 3);
-    if (result > 0) {
-        point.setValue(xyz[0], xyz[1], xyz[2]);
-    }
-    return OxToBool(result >= 0);
+    return readPoint(attributeName, point, 3);
 }
 
 OxBool OxXmlElement::getPoint(char const* attributeName, OxVec4d& point) const {
-    if (attributeName == nullptr) {
-        return OxFalse;
-    }
-    double xyzw[4];
-    int result = readNumbers(attributeName, xyzw, 4);
-    if (result > 0) {
-        point.setValue(xyzw[0], xyzw[1], xyzw[2], xyzw[3]);
-    }
-    return OxToBool(result >= 0);
+    return readPoint(attributeName, point, 4);
 }

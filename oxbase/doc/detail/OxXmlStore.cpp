@@ -69,7 +69,6 @@ void OxXmlStore::newSlab(std::size_t size, char*& areaCursor, char*& areaEnd) {
     slabs = new (memory) Slab{slabs};
     areaCursor = memory + kHeader;
     areaEnd = memory + slabBytes;
-    bytes += slabBytes;
     if (nextSlabBytes < kLargestSlab) {
         nextSlabBytes *= 2;
     }

@@ -107,9 +107,6 @@ public:
     /// caller with names it holds here; they go with the store.
     OxCsvColumns* newColumns(char separator);
 
-    /// Bytes of slabs taken from the heap.
-    std::size_t getBytes() const { return bytes; }
-
 private:
     /// `size` bytes aligned for a pointer.
     void* allocate(std::size_t size);
@@ -136,7 +133,6 @@ private:
     char* nodeCursor = nullptr; ///< the area of built elements and lists
     char* nodeEnd = nullptr;
     std::size_t nextSlabBytes = 0;
-    std::size_t bytes = 0;
     OxGList<char const*> names{0};
     OxGList<OxCsvColumns*> tables{0};
     OxGList<OxXmlNodeRecord*> nodes{0};
